@@ -1,0 +1,60 @@
+# What every target of the project is built with, and the functions that declare rooms, programs and tests.
+
+set(NORVEX_COMPILE_OPTIONS -Wall -Wextra -Wpedantic -Wconversion -Wshadow)
+if(NORVEX_WARNINGS_AS_ERRORS)
+  list(APPEND NORVEX_COMPILE_OPTIONS -Werror)
+endif()
+if(NORVEX_SANITIZE)
+  list(APPEND NORVEX_COMPILE_OPTIONS -fsanitize=${NORVEX_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+endif()
+
+function(norvex_target_settings target)
+  set_target_properties(${target} PROPERTIES CXX_STANDARD 20 CXX_STANDARD_REQUIRED ON CXX_EXTENSIONS OFF)
+  target_compile_options(${target} PRIVATE ${NORVEX_COMPILE_OPTIONS})
+  if(NORVEX_SANITIZE)
+    target_link_options(${target} PRIVATE -fsanitize=${NORVEX_SANITIZE})
+  endif()
+endfunction()
+
+# norvex_room(NAME SOURCES a.cpp ... ROOMS platform ... LIBRARIES PkgConfig::X ...)
+#
+# Declares the library norvex_NAME. Its headers are included as "folder/Header.h". They are reached through a folder
+# in the build tree that holds links to the headers of this room alone, so that a room sees the headers of the rooms
+# it links and no others.
+function(norvex_room name)
+  cmake_parse_arguments(ROOM "" "" "SOURCES;ROOMS;LIBRARIES" ${ARGN})
+  add_library(norvex_${name} STATIC ${ROOM_SOURCES})
+  norvex_target_settings(norvex_${name})
+
+  set(include_root ${CMAKE_BINARY_DIR}/include/${name})
+  file(RELATIVE_PATH folder ${CMAKE_SOURCE_DIR} ${CMAKE_CURRENT_SOURCE_DIR})
+  file(REMOVE_RECURSE ${include_root})
+  file(MAKE_DIRECTORY ${include_root}/${folder})
+  file(GLOB headers CONFIGURE_DEPENDS RELATIVE ${CMAKE_CURRENT_SOURCE_DIR} *.h *.def)
+  foreach(header IN LISTS headers)
+    file(CREATE_LINK ${CMAKE_CURRENT_SOURCE_DIR}/${header} ${include_root}/${folder}/${header} SYMBOLIC)
+  endforeach()
+  target_include_directories(norvex_${name} PUBLIC ${include_root})
+
+  foreach(room IN LISTS ROOM_ROOMS)
+    target_link_libraries(norvex_${name} PUBLIC norvex_${room})
+  endforeach()
+  target_link_libraries(norvex_${name} PRIVATE ${ROOM_LIBRARIES})
+endfunction()
+
+# norvex_test(NAME SOURCES a.cpp ... LIBRARIES norvex_x ... [THREADED])
+#
+# Declares the test program NAME and every test in it. THREADED gives its tests the label "threaded": they run
+# under the thread sanitizer too.
+function(norvex_test name)
+  cmake_parse_arguments(TEST "THREADED" "" "SOURCES;LIBRARIES" ${ARGN})
+  add_executable(${name} ${TEST_SOURCES})
+  norvex_target_settings(${name})
+  target_compile_definitions(${name} PRIVATE NORVEX_SOURCE_DIR="${CMAKE_SOURCE_DIR}")
+  target_link_libraries(${name} PRIVATE ${TEST_LIBRARIES} GTest::gmock GTest::gtest_main)
+  set(labels "")
+  if(TEST_THREADED)
+    set(labels PROPERTIES LABELS threaded)
+  endif()
+  gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 60 ${labels})
+endfunction()

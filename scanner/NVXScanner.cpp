@@ -1,0 +1,1 @@
+#include "scanner/NVXScanner.h"
