@@ -57,6 +57,9 @@ class MetadataQuery {
   // `observer` is called once, on the main task queue, when every match has been gathered - unless it has
   // been removed by then.
   virtual ObserverToken addFinishObserver(FinishObserver observer) = 0;
+
+  // From now on the observer is not called any more. When it is being called on another thread, returns only
+  // after that call: whatever the observer has done is then visible to the caller.
   virtual void removeFinishObserver(ObserverToken token) = 0;
 
   // Begins to gather matches, as inputs of the calling thread's event loop. False when it cannot: the
@@ -64,7 +67,8 @@ class MetadataQuery {
   // called.
   virtual bool start() = 0;
 
-  // Ends the gathering; from now on the query is stopped. May be called on another thread than start().
+  // Ends the gathering; from now on the query is stopped. May be called on another thread than start(), whose
+  // loop's pass it then ends at once.
   virtual void stop() = 0;
   virtual bool isStopped() const = 0;
 
