@@ -20,7 +20,6 @@ namespace norvex {
 namespace {
 
 using testing::ElementsAre;
-using testing::IsEmpty;
 using testing::SizeIs;
 using Message = ReportWorld::Message;
 
@@ -244,6 +243,7 @@ TEST(DiagnosticReport, LetsNoExactSizeOrCountIntoTheFirstTwoMessages) {
   std::mt19937_64 random(7);
   for (int run = 0; run < 200; ++run) {
     const std::vector<Message> messages = messagesOf(randomRecord(random), false);
+    ASSERT_THAT(messages, SizeIs(2));
     for (std::size_t m = 0; m < 2; ++m) {
       const auto& rows = reportMessages()[m].rows;
       for (std::size_t r = 0; r < rows.size(); ++r) {

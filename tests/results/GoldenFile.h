@@ -10,9 +10,9 @@ std::string readGolden(const std::string& name);
 
 // Expects `text` to be the whole file; a difference is shown line by line.
 //
-// With NORVEX_REWRITE_GOLDEN=1 in the environment the file is rewritten instead and the test fails all the
-// same, so that nobody takes that run for a passed one. The files were worked out by hand and by another
-// program: look at every changed line, each is a change of what readers of the reports get.
+// With NORVEX_REWRITE_GOLDEN=1 in the environment the file is rewritten instead, and the test fails all the
+// same, so that nobody takes that run for a passed one. The files were worked out by another program: look at
+// every changed line, each is a change of what readers of the reports get.
 void expectGolden(const std::string& name, const std::string& text);
 
 }  // namespace norvex

@@ -5,7 +5,8 @@
 #include <gtest/gtest.h>
 
 #include <limits>
-#include <sstream>
+#include <memory>
+#include <string>
 
 #include "GoldenFile.h"
 #include "RecordFields.h"
