@@ -23,8 +23,8 @@ inline constexpr const char* queryPredicates[] = {
     "kMDItemContentTypeTree == 'public.audio'",
     "kMDItemContentTypeTree == 'public.movie' || kMDItemContentTypeTree == 'public.video'",
     "kMDItemContentType == 'com.brixo.sonpix.ipa'",
-    "kMDItemContentType == 'com.vmware.vm-package' || "
-    "kMDItemContentType == 'com.parallels.vm.vmpackage' || kMDItemKind == 'Virtual Disk Image'",
+    ("kMDItemContentType == 'com.vmware.vm-package' || "
+     "kMDItemContentType == 'com.parallels.vm.vmpackage' || kMDItemKind == 'Virtual Disk Image'"),
 };
 
 // The home folder of "/Users/user" is there with everything that is measured in it, all empty; every volume

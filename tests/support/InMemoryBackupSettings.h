@@ -11,15 +11,16 @@
 
 namespace norvex {
 
+// What the settings say while they are available.
+struct BackupSettingsContent {
+  bool automaticBackupsEnabled = false;
+  std::vector<std::string> destinations;
+  bool systemFilesSkipped = false;
+  std::optional<std::vector<std::string>> includedVolumes;
+};
+
 class InMemoryBackupSettings final : public BackupSettings {
  public:
-  struct Content {
-    bool automaticBackupsEnabled = false;
-    std::vector<std::string> destinations;
-    bool systemFilesSkipped = false;
-    std::optional<std::vector<std::string>> includedVolumes;
-  };
-
   explicit InMemoryBackupSettings(CallJournal& calls) : calls_(calls) {}
 
   std::unique_ptr<BackupSettingsHandle> open() override {
@@ -30,7 +31,7 @@ class InMemoryBackupSettings final : public BackupSettings {
   }
 
   // Absent: the settings are not available.
-  std::optional<Content> content;
+  std::optional<BackupSettingsContent> content;
   int openHandles = 0;
 
  private:
@@ -51,7 +52,7 @@ class InMemoryBackupSettings final : public BackupSettings {
 
    private:
     InMemoryBackupSettings& owner_;
-    Content content_;
+    BackupSettingsContent content_;
   };
 
   CallJournal& calls_;
