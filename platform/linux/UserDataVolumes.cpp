@@ -20,27 +20,17 @@ namespace {
 //  - fuse.* (bindfs, mergerfs, encrypted folders, ...) and ecryptfs show again what lies in another one;
 //  - autofs is a place where something may be mounted.
 constexpr std::string_view kUserDataTypes[] = {
-    "apfs",      // Apple's, by an external module
-    "bcachefs",  //
-    "btrfs",     //
-    "exfat",     // memory cards and sticks
-    "ext2",      //
-    "ext3",      //
-    "ext4",      //
-    "f2fs",      // flash memory
-    "fuseblk",   // a file system on a local disk by way of FUSE: ntfs-3g, exfat-fuse
-    "hfs",       //
-    "hfsplus",   //
-    "jfs",       //
-    "msdos",     // as vfat, with short names only
-    "nilfs2",    //
-    "ntfs",      //
-    "ntfs3",     //
-    "reiserfs",  //
-    "ufs",       //
-    "vfat",      // sticks and cameras; not where it is the EFI system partition
-    "xfs",       //
-    "zfs",       //
+    "apfs",  // Apple's, by an external module
+    "bcachefs", "btrfs",
+    "exfat",  // memory cards and sticks
+    "ext2",     "ext3",    "ext4",
+    "f2fs",     // flash memory
+    "fuseblk",  // a file system on a local disk by way of FUSE: ntfs-3g, exfat-fuse
+    "hfs",      "hfsplus", "jfs",
+    "msdos",  // as vfat, with short names only
+    "nilfs2",   "ntfs",    "ntfs3", "reiserfs", "ufs",
+    "vfat",  // sticks and cameras; not where it is the EFI system partition
+    "xfs",      "zfs",
 };
 
 constexpr std::string_view kOverlay = "overlay";
