@@ -145,24 +145,32 @@ bool compileLocale(const ScratchFolder& folder, const Convention& convention) {
   return std::filesystem::exists(target + "/LC_NUMERIC") && std::filesystem::exists(target + "/LC_CTYPE");
 }
 
+// In a child with the locales in `folder`: the C library gives the path that it searches for them never back.
+ChildEnd withLocalesIn(const ScratchFolder& folder, const std::function<std::string()>& body) {
+  return inChild([&] {
+    ::setenv("LOCPATH", folder.path().c_str(), 1);
+    return body();
+  });
+}
+
 TEST(ByteCountFormatter, GroupsAndSeparatesAsTheLocaleDoes) {
   const ScratchFolder folder;
-  ::setenv("LOCPATH", folder.path().c_str(), 1);
   for (const Convention& convention : kConventions) {
     if (!compileLocale(folder, convention)) GTEST_SKIP() << "localedef or its charmaps are not installed";
-    const LocaleByteCountFormatter formatter(convention.name);
-    EXPECT_EQ(formatter.string(999'999), convention.thousandKilobytes) << convention.name;
-    EXPECT_EQ(formatter.string(1'500'000), convention.oneAndAHalfMegabytes) << convention.name;
-    EXPECT_EQ(formatter.string(0), "Zero KB");
+    const ChildEnd end = withLocalesIn(folder, [&] {
+      const LocaleByteCountFormatter formatter(convention.name);
+      return formatter.string(999'999) + " | " + formatter.string(1'500'000) + " | " + formatter.string(0);
+    });
+    EXPECT_EQ(end.report, std::string(convention.thousandKilobytes) + " | " +
+                              convention.oneAndAHalfMegabytes + " | Zero KB")
+        << convention.name;
   }
-  ::unsetenv("LOCPATH");
 }
 
 TEST(ByteCountFormatter, TheUsersOwnLocaleIsTheOneOfTheEnvironment) {
   const ScratchFolder folder;
   if (!compileLocale(folder, kConventions[1])) GTEST_SKIP() << "localedef or its charmaps are not installed";
-  const ChildEnd end = inChild([&] {
-    ::setenv("LOCPATH", folder.path().c_str(), 1);
+  const ChildEnd end = withLocalesIn(folder, [&] {
     ::unsetenv("LC_ALL");
     ::setenv("LC_NUMERIC", kConventions[1].name, 1);
     const std::string german = LocaleByteCountFormatter().string(1'500'000);
