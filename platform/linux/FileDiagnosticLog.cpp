@@ -9,7 +9,7 @@
 #include <utility>
 
 #include "platform/linux/DiagnosticMessageText.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {
@@ -66,23 +66,23 @@ void FileDiagnosticLog::logWithKeys(std::string_view domain, int level,
 
 void FileDiagnosticLog::append(std::string line) {
   if (makePrivateFolders(folder_) != 0) return;
-  const FileHandle file(::open(path_.c_str(),
-                               O_RDWR | O_APPEND | O_CREAT | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY,
-                               kPrivateFileMode));
+  const FileDescriptor file(
+      ::open(path_.c_str(), O_RDWR | O_APPEND | O_CREAT | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY,
+             kPrivateFileMode));
   if (!file) return;
   // Without the lock the line is written all the same, in one call and so in one piece. Only taking it back
   // is left out then: it could take another writer's line along.
-  const bool locked = lockWithin(file.get(), kLockLimit);
+  const bool locked = lockWithin(file.number(), kLockLimit);
   struct stat status {};
-  if (::fstat(file.get(), &status) != 0 || !S_ISREG(status.st_mode)) return;
+  if (::fstat(file.number(), &status) != 0 || !S_ISREG(status.st_mode)) return;
 
-  if (endsInsideLine(file.get(), status.st_size)) line.insert(line.begin(), '\n');
-  const ssize_t written = writeOnce(file.get(), line);
+  if (endsInsideLine(file.number(), status.st_size)) line.insert(line.begin(), '\n');
+  const ssize_t written = writeOnce(file.number(), line);
   if (written != static_cast<ssize_t>(line.size())) {
-    if (locked && written > 0) takeBackTo(status.st_size, file.get());
+    if (locked && written > 0) takeBackTo(status.st_size, file.number());
     return;
   }
-  ::fsync(file.get());
+  ::fsync(file.number());
   syncFolder(folder_);
 }
 

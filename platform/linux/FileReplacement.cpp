@@ -22,11 +22,11 @@ constexpr std::chrono::milliseconds kLockLimit{2000};
 
 // Makes the file at `path`, which is not there yet, and brings it to the disk.
 int writeNewFile(const std::string& path, std::string_view text) {
-  const FileHandle file(
+  const FileDescriptor file(
       ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC | O_NOFOLLOW, kPrivateFileMode));
   if (!file) return errno;
-  if (const int error = writeAll(file.get(), text)) return error;
-  return ::fsync(file.get()) == 0 ? 0 : errno;
+  if (const int error = writeAll(file.number(), text)) return error;
+  return ::fsync(file.number()) == 0 ? 0 : errno;
 }
 
 int renameFile(const std::string& from, const std::string& to) {
@@ -39,8 +39,8 @@ FileReplacement::FileReplacement(std::string path) : path_(std::move(path)) {
   const std::size_t nameStart = path_.find_last_of('/') + 1;  // 0 when there is no separator
   folderPath_ = nameStart == 0 ? "./" : path_.substr(0, nameStart);
   unfinishedPrefix_ = "." + path_.substr(nameStart) + ".unfinished-";
-  folder_ = FileHandle(::open(folderPath_.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-  if (folder_ && lockWithin(folder_.get(), kLockLimit)) removeUnfinished();
+  folder_ = FileDescriptor(::open(folderPath_.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  if (folder_ && lockWithin(folder_.number(), kLockLimit)) removeUnfinished();
 }
 
 // Only with the folder locked: whatever unfinished file there is then belongs to a process that has died.
@@ -50,7 +50,7 @@ void FileReplacement::removeUnfinished() const {
   if (!folder) return;
   while (const dirent* entry = ::readdir(folder.get())) {
     const std::string_view name = entry->d_name;
-    if (name.starts_with(unfinishedPrefix_)) ::unlinkat(folder_.get(), entry->d_name, 0);
+    if (name.starts_with(unfinishedPrefix_)) ::unlinkat(folder_.number(), entry->d_name, 0);
   }
 }
 
@@ -65,7 +65,7 @@ int FileReplacement::commit(std::string_view text, const std::string& keptAs) {
     ::unlink(unfinished.c_str());
     return error;
   }
-  return ::fsync(folder_.get()) == 0 ? 0 : errno;
+  return ::fsync(folder_.number()) == 0 ? 0 : errno;
 }
 
 // Moves the old file away, when that is asked for, and the new one into its place.

@@ -8,7 +8,7 @@
 #include <string>
 #include <string_view>
 
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 
@@ -31,7 +31,7 @@ class FileReplacement {
   std::string path_;
   std::string folderPath_;
   std::string unfinishedPrefix_;
-  FileHandle folder_;
+  FileDescriptor folder_;
 };
 
 }  // namespace norvex

@@ -8,7 +8,7 @@
 #include <cerrno>
 #include <thread>
 
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {
@@ -47,13 +47,13 @@ int readUpTo(int descriptor, std::size_t limit, std::string& text) {
 }  // namespace
 
 Result<std::string> readStartOfFile(const std::string& path, std::size_t limit) {
-  const FileHandle file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
   if (!file) return systemError(errno);
   struct stat status {};
-  if (::fstat(file.get(), &status) != 0) return systemError(errno);
+  if (::fstat(file.number(), &status) != 0) return systemError(errno);
   if (!S_ISREG(status.st_mode)) return systemError(S_ISDIR(status.st_mode) ? EISDIR : EINVAL);
   std::string text;
-  if (const int error = readUpTo(file.get(), limit, text)) return systemError(error);
+  if (const int error = readUpTo(file.number(), limit, text)) return systemError(error);
   return text;
 }
 
@@ -87,8 +87,8 @@ int writeAll(int descriptor, std::string_view text) {
 }
 
 int syncFolder(const std::string& path) {
-  const FileHandle folder(::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-  if (!folder || ::fsync(folder.get()) != 0) return errno;
+  const FileDescriptor folder(::open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  if (!folder || ::fsync(folder.number()) != 0) return errno;
   return 0;
 }
 

@@ -46,12 +46,12 @@ LinuxActivityScheduler::LinuxActivityScheduler(const Environment& environment)
     : startedForRun_(valueOf(environment, kStartedProcess) == std::to_string(::getpid())),
       ending_(::eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK)) {
   const sigset_t signals = runSignalSet();
-  signals_ = FileHandle(::signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
+  signals_ = FileDescriptor(::signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
 }
 
 LinuxActivityScheduler::~LinuxActivityScheduler() {
   if (!queue_.joinable()) return;
-  ::eventfd_write(ending_.get(), 1);
+  ::eventfd_write(ending_.number(), 1);
   queue_.join();
 }
 
@@ -77,12 +77,12 @@ void LinuxActivityScheduler::serve(const Handler& handler) const {
 
 // True when a signal has come and been taken, false when the thread is to end.
 bool LinuxActivityScheduler::waitForRunSignal() const {
-  pollfd sources[] = {{ending_.get(), POLLIN, 0}, {signals_.get(), POLLIN, 0}};
+  pollfd sources[] = {{ending_.number(), POLLIN, 0}, {signals_.number(), POLLIN, 0}};
   while (true) {
     if (::poll(sources, std::size(sources), -1) < 0 && errno != EINTR) return false;
     if (sources[0].revents != 0) return false;
     signalfd_siginfo taken{};
-    if (::read(signals_.get(), &taken, sizeof(taken)) == sizeof(taken)) return true;
+    if (::read(signals_.number(), &taken, sizeof(taken)) == sizeof(taken)) return true;
   }
 }
 

@@ -10,7 +10,7 @@
 
 #include "platform/ActivityScheduler.h"
 #include "platform/linux/Environment.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 
@@ -37,8 +37,8 @@ class LinuxActivityScheduler final : public ActivityScheduler {
   bool waitForRunSignal() const;
 
   bool startedForRun_ = false;
-  FileHandle signals_;  // readable when a SIGUSR1 is pending
-  FileHandle ending_;   // readable when the queue thread is to end
+  FileDescriptor signals_;  // readable when a SIGUSR1 is pending
+  FileDescriptor ending_;   // readable when the queue thread is to end
   std::thread queue_;
 };
 

@@ -8,7 +8,7 @@
 #include <string_view>
 #include <utility>
 
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {

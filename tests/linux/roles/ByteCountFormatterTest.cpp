@@ -10,7 +10,7 @@
 
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
 
 namespace norvex {
@@ -134,9 +134,9 @@ bool compileLocale(const ScratchFolder& folder, const Convention& convention) {
                        "\"\ngrouping " + convention.grouping + "\nEND LC_NUMERIC\n");
   const std::string target = folder.at(convention.name);
   inChild([&] {
-    const FileHandle nowhere(::open("/dev/null", O_RDWR));
-    ::dup2(nowhere.get(), STDOUT_FILENO);
-    ::dup2(nowhere.get(), STDERR_FILENO);
+    const FileDescriptor nowhere(::open("/dev/null", O_RDWR));
+    ::dup2(nowhere.number(), STDOUT_FILENO);
+    ::dup2(nowhere.number(), STDERR_FILENO);
     // -c: the categories that are not described here are no reason to stop.
     ::execlp("localedef", "localedef", "-c", "-f", convention.charset, "-i", source.c_str(), target.c_str(),
              nullptr);

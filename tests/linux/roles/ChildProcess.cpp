@@ -11,7 +11,7 @@
 #include <cstdlib>
 #include <system_error>
 
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {
@@ -22,8 +22,8 @@ std::string impossible(const std::string& step) {
 }
 
 bool writeLine(const std::string& path, const std::string& text) {
-  const FileHandle file(::open(path.c_str(), O_WRONLY | O_CLOEXEC));
-  return file && writeAll(file.get(), text) == 0;
+  const FileDescriptor file(::open(path.c_str(), O_WRONLY | O_CLOEXEC));
+  return file && writeAll(file.number(), text) == 0;
 }
 
 // Root in a user namespace of its own may mount.
@@ -38,20 +38,20 @@ bool becomeRootOfNamespace(unsigned user, unsigned group) {
 ChildEnd inChild(const std::function<std::string()>& body) {
   int ends[2] = {};
   if (::pipe2(ends, O_CLOEXEC) != 0) std::abort();
-  FileHandle readEnd(ends[0]);
-  FileHandle writeEnd(ends[1]);
+  FileDescriptor readEnd(ends[0]);
+  FileDescriptor writeEnd(ends[1]);
   const pid_t child = ::fork();
   if (child < 0) std::abort();
   if (child == 0) {
     const std::string report = body();
-    writeAll(writeEnd.get(), report);
+    writeAll(writeEnd.number(), report);
     ::_exit(0);
   }
-  writeEnd = FileHandle();
+  writeEnd = FileDescriptor();
   ChildEnd end;
   char buffer[4096];
   ssize_t count = 0;
-  while ((count = ::read(readEnd.get(), buffer, sizeof(buffer))) > 0) {
+  while ((count = ::read(readEnd.number(), buffer, sizeof(buffer))) > 0) {
     end.report.append(buffer, static_cast<std::size_t>(count));
   }
   ::waitpid(child, &end.status, 0);

@@ -14,7 +14,7 @@
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
 #include "platform/linux/DiagnosticMessageText.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {
@@ -139,8 +139,8 @@ TEST(FileDiagnosticLog, WhereTheFolderCannotBeMadeTheMessageIsLost) {
 TEST(FileDiagnosticLog, ALockThatIsNeverGivenBackDoesNotLoseTheMessage) {
   const ScratchFolder folder;
   const std::string path = folder.write(kFile, "");
-  const FileHandle other(::open(path.c_str(), O_RDONLY));
-  ASSERT_EQ(::flock(other.get(), LOCK_EX), 0);
+  const FileDescriptor other(::open(path.c_str(), O_RDONLY));
+  ASSERT_EQ(::flock(other.number(), LOCK_EX), 0);
   FileDiagnosticLog log = logIn(folder.path());
   logOne(log, "1");
   EXPECT_EQ(contentOf(path), lineWith("1"));

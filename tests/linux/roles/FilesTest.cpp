@@ -10,7 +10,7 @@
 
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {
@@ -57,13 +57,13 @@ TEST(Files, AFileInTheWayOfAFolderIsAFailure) {
 TEST(Files, ALockThatSomebodyElseHoldsIsGivenUpAtTheLimit) {
   const ScratchFolder folder;
   const std::string path = folder.write("file", "");
-  const FileHandle mine(::open(path.c_str(), O_RDONLY));
+  const FileDescriptor mine(::open(path.c_str(), O_RDONLY));
   {
-    const FileHandle other(::open(path.c_str(), O_RDONLY));
-    ASSERT_TRUE(lockWithin(other.get(), std::chrono::milliseconds(0)));
-    EXPECT_FALSE(lockWithin(mine.get(), std::chrono::milliseconds(15)));
+    const FileDescriptor other(::open(path.c_str(), O_RDONLY));
+    ASSERT_TRUE(lockWithin(other.number(), std::chrono::milliseconds(0)));
+    EXPECT_FALSE(lockWithin(mine.number(), std::chrono::milliseconds(15)));
   }
-  EXPECT_TRUE(lockWithin(mine.get(), std::chrono::milliseconds(0))) << "it ends with the other's file";
+  EXPECT_TRUE(lockWithin(mine.number(), std::chrono::milliseconds(0))) << "it ends with the other's file";
 }
 
 }  // namespace

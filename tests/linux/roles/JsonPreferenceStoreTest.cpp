@@ -13,7 +13,7 @@
 
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {
@@ -334,18 +334,18 @@ class EndlessWriter {
   explicit EndlessWriter(const std::string& folder) {
     int ends[2] = {};
     if (::pipe2(ends, O_CLOEXEC) != 0) std::abort();
-    progress_ = FileHandle(ends[0]);
-    const FileHandle report(ends[1]);
+    progress_ = FileDescriptor(ends[0]);
+    const FileDescriptor report(ends[1]);
     process_ = ::fork();
     if (process_ != 0) return;
     for (std::int64_t value = 1;; ++value) {
       store(folder, value);
-      if (::write(report.get(), "", 1) != 1) ::_exit(1);
+      if (::write(report.number(), "", 1) != 1) ::_exit(1);
     }
   }
 
   void waitForStores(int count) const {
-    for (char byte = 0; count > 0; --count) ASSERT_EQ(::read(progress_.get(), &byte, 1), 1);
+    for (char byte = 0; count > 0; --count) ASSERT_EQ(::read(progress_.number(), &byte, 1), 1);
   }
 
   void kill() const {
@@ -354,7 +354,7 @@ class EndlessWriter {
   }
 
  private:
-  FileHandle progress_;
+  FileDescriptor progress_;
   pid_t process_ = 0;
 };
 

@@ -10,7 +10,7 @@
 #include <cstring>
 
 #include "ChildProcess.h"
-#include "platform/linux/FileHandle.h"
+#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {
@@ -18,18 +18,18 @@ namespace {
 using testing::MatchesRegex;
 
 // The log's socket, where the C library expects it. For a child with mounts of its own.
-FileHandle listenAtDevLog() {
-  FileHandle listener(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+FileDescriptor listenAtDevLog() {
+  FileDescriptor listener(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
   sockaddr_un address{};
   address.sun_family = AF_UNIX;
   std::strcpy(address.sun_path, "/dev/log");
-  if (::bind(listener.get(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)) != 0) return {};
+  if (::bind(listener.number(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)) != 0) return {};
   return listener;
 }
 
-std::string nextDatagram(const FileHandle& listener) {
+std::string nextDatagram(const FileDescriptor& listener) {
   char buffer[4096];
-  const ssize_t count = ::recv(listener.get(), buffer, sizeof(buffer), MSG_DONTWAIT);
+  const ssize_t count = ::recv(listener.number(), buffer, sizeof(buffer), MSG_DONTWAIT);
   return count < 0 ? "(nothing)" : std::string(buffer, static_cast<std::size_t>(count));
 }
 
@@ -37,7 +37,7 @@ std::string nextDatagram(const FileHandle& listener) {
 ChildEnd logged(LogLevel level, const std::string& message) {
   return inChild([&]() -> std::string {
     if (const std::string problem = mountSmallDisk("/dev", "64k"); !problem.empty()) return problem;
-    const FileHandle listener = listenAtDevLog();
+    const FileDescriptor listener = listenAtDevLog();
     if (!listener) return "no socket";
     SyslogSystemLog log;
     log.syslog(level, message);
