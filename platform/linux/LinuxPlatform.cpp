@@ -1,0 +1,48 @@
+#include "platform/linux/LinuxPlatform.h"
+
+#include <string>
+#include <vector>
+
+namespace norvex {
+namespace {
+
+constexpr const char* kSystemConfigFolder = "/etc";
+constexpr const char* kOwnFolder = "/norvex";
+
+}  // namespace
+
+LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environment& environment)
+    : folders_(XdgFolders::fromEnvironment(environment)),
+      processControl_(std::vector<std::string>(argv, argv + argc)),
+      userFolders_(folders_),
+      backupSettings_({folders_.config, kSystemConfigFolder}, systemLog_),
+      diagnosticLog_(folders_.state),
+      preferenceStore_(folders_.config + kOwnFolder),
+      activityScheduler_(environment) {}
+
+Platform LinuxPlatform::roles(MetadataIndex& metadataIndex) {
+  return {.activityScheduler = activityScheduler_,
+          .backupSettings = backupSettings_,
+          .byteCountFormatter = byteCountFormatter_,
+          .clock = clock_,
+          .diagnosticLog = diagnosticLog_,
+          .directoryEnumeration = directoryEnumeration_,
+          .directoryListing = directoryListing_,
+          .eventLoops = eventLoops_,
+          .fileExistence = fileExistence_,
+          .installation = installation_,
+          .jobRegistry = jobRegistry_,
+          .mediaMetadataReader = mediaMetadataReader_,
+          .memoryPressureSource = memoryPressureSource_,
+          .metadataIndex = metadataIndex,
+          .preferenceStore = preferenceStore_,
+          .processControl = processControl_,
+          .processMemoryInfo = processMemoryInfo_,
+          .resourceValues = resourceValues_,
+          .systemControl = systemControl_,
+          .systemLog = systemLog_,
+          .userFolders = userFolders_,
+          .volumeCatalog = volumeCatalog_};
+}
+
+}  // namespace norvex

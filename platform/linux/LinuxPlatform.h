@@ -1,0 +1,75 @@
+// All roles as Linux plays them, in one object: what a program makes first and keeps to its end.
+//
+// Made on the main thread before any other is started; what it hands out may then be used as each role says.
+#pragma once
+
+#include "platform/MetadataIndex.h"
+#include "platform/Platform.h"
+#include "platform/linux/AbsentJobRegistry.h"
+#include "platform/linux/ConfBackupSettings.h"
+#include "platform/linux/Environment.h"
+#include "platform/linux/FileDiagnosticLog.h"
+#include "platform/linux/JsonPreferenceStore.h"
+#include "platform/linux/LinuxActivityScheduler.h"
+#include "platform/linux/LinuxDirectoryEnumeration.h"
+#include "platform/linux/LinuxDirectoryListing.h"
+#include "platform/linux/LinuxFileExistence.h"
+#include "platform/linux/LinuxProcessControl.h"
+#include "platform/linux/LinuxResourceValues.h"
+#include "platform/linux/LinuxSystemControl.h"
+#include "platform/linux/LinuxUserFolders.h"
+#include "platform/linux/LocaleByteCountFormatter.h"
+#include "platform/linux/MarkerFileInstallation.h"
+#include "platform/linux/NoMediaMetadata.h"
+#include "platform/linux/ProcStatusMemoryInfo.h"
+#include "platform/linux/SilentMemoryPressureSource.h"
+#include "platform/linux/StatvfsVolumeCatalog.h"
+#include "platform/linux/SteadyClock.h"
+#include "platform/linux/SyslogSystemLog.h"
+#include "platform/linux/ThreadEventLoops.h"
+#include "platform/linux/XdgFolders.h"
+
+namespace norvex {
+
+class LinuxPlatform {
+ public:
+  // The command line as main got it, and the environment of the process.
+  LinuxPlatform(int argc, const char* const* argv, const Environment& environment);
+  LinuxPlatform(const LinuxPlatform&) = delete;
+  LinuxPlatform& operator=(const LinuxPlatform&) = delete;
+
+  // References to the roles of this object and to the index, which is the one role that is made elsewhere.
+  // Both outlive whoever uses the set.
+  Platform roles(MetadataIndex& metadataIndex);
+
+  // What an index is made of.
+  EventLoops& eventLoops() { return eventLoops_; }
+  const XdgFolders& folders() const { return folders_; }
+
+ private:
+  XdgFolders folders_;
+  SyslogSystemLog systemLog_;
+  LinuxProcessControl processControl_;
+  LinuxUserFolders userFolders_;
+  ConfBackupSettings backupSettings_;
+  LocaleByteCountFormatter byteCountFormatter_;
+  SteadyClock clock_;
+  FileDiagnosticLog diagnosticLog_;
+  LinuxDirectoryEnumeration directoryEnumeration_;
+  LinuxDirectoryListing directoryListing_;
+  ThreadEventLoops eventLoops_;
+  LinuxFileExistence fileExistence_;
+  MarkerFileInstallation installation_;
+  AbsentJobRegistry jobRegistry_;
+  NoMediaMetadata mediaMetadataReader_;
+  SilentMemoryPressureSource memoryPressureSource_;
+  JsonPreferenceStore preferenceStore_;
+  ProcStatusMemoryInfo processMemoryInfo_;
+  LinuxResourceValues resourceValues_;
+  LinuxSystemControl systemControl_;
+  StatvfsVolumeCatalog volumeCatalog_;
+  // Last, so that its queue thread ends before anything that its handler uses.
+  LinuxActivityScheduler activityScheduler_;
+};
+
+}  // namespace norvex
