@@ -12,7 +12,7 @@ namespace norvex {
 namespace {
 
 constexpr const char* kFileInFolder = "/chronel/backup.conf";
-constexpr std::size_t kLargestFile = 1024 * 1024;
+constexpr std::size_t kLargestFile = std::size_t{1024} * 1024;
 
 bool isMissing(const Error& error) {
   return error.code == ENOENT || error.code == ENOTDIR;

@@ -14,7 +14,7 @@ namespace norvex {
 namespace {
 
 constexpr mode_t kPrivateFolderMode = 0700;
-constexpr std::size_t kReadStep = 16 * 1024;
+constexpr std::size_t kReadStep = std::size_t{16} * 1024;
 constexpr std::chrono::milliseconds kLockStep{10};
 
 std::string parentOf(const std::string& path) {

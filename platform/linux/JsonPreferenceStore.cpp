@@ -1,10 +1,10 @@
 #include "platform/linux/JsonPreferenceStore.h"
 
 #include <cerrno>
-#include <cstdlib>
-#include <memory>
+#include <filesystem>
 #include <nlohmann/json.hpp>
 #include <string_view>
+#include <system_error>
 #include <utility>
 
 #include "platform/linux/FileReplacement.h"
@@ -16,7 +16,7 @@ namespace {
 using Json = nlohmann::ordered_json;
 
 // A file beyond these is not one of ours. The depth bounds the recursion of writing it again.
-constexpr std::size_t kLargestFile = 1024 * 1024;
+constexpr std::size_t kLargestFile = std::size_t{1024} * 1024;
 constexpr int kDeepestNesting = 64;
 
 constexpr int kIndent = 2;
@@ -45,9 +45,9 @@ Stored read(const std::string& path) {
 
 // The file that `path` leads to; itself when it is missing or a link that leads nowhere.
 std::string resolved(const std::string& path) {
-  const auto release = [](char* text) { std::free(text); };
-  const std::unique_ptr<char, decltype(release)> target(::realpath(path.c_str(), nullptr), release);
-  return target ? std::string(target.get()) : path;
+  std::error_code error;
+  const std::filesystem::path target = std::filesystem::canonical(path, error);
+  return error ? path : target.string();
 }
 
 bool standsForItself(char character, bool first) {

@@ -14,7 +14,7 @@ namespace {
 
 // No model name is nearly as long; one that is cut here does not fit any caller's buffer either.
 constexpr std::size_t kLongestFact = 4096;
-constexpr std::size_t kLargestMachineInfo = 64 * 1024;
+constexpr std::size_t kLargestMachineInfo = std::size_t{64} * 1024;
 
 constexpr std::string_view kEndings{"\n\r\t \0", 5};
 

@@ -8,7 +8,6 @@
 #include <string_view>
 #include <utility>
 
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {

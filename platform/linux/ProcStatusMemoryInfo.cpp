@@ -10,7 +10,7 @@
 namespace norvex {
 namespace {
 
-constexpr std::size_t kLargestStatus = 64 * 1024;
+constexpr std::size_t kLargestStatus = std::size_t{64} * 1024;
 constexpr std::uint64_t kBytesPerKilobyte = 1024;  // the kernel's "kB"
 
 std::string_view withoutLeadingBlanks(std::string_view text) {

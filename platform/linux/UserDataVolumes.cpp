@@ -79,6 +79,7 @@ Result<std::vector<std::string>> userDataVolumes(const std::string& mountInfoPat
     if (!isNew && isBetter(mount.target, known->second)) known->second = mount.target;
   }
   std::vector<std::string> volumes;
+  volumes.reserve(mountPoints.size());
   for (const auto& [device, mountPoint] : mountPoints) volumes.push_back(mountPoint);
   std::sort(volumes.begin(), volumes.end());
   return volumes;

@@ -15,7 +15,7 @@ namespace {
 constexpr std::string_view kNoHome = "/nonexistent";
 
 constexpr std::size_t kFirstPasswordEntrySize = 4096;
-constexpr std::size_t kLargestPasswordEntrySize = 1024 * 1024;
+constexpr std::size_t kLargestPasswordEntrySize = std::size_t{1024} * 1024;
 
 struct BaseFolder {
   std::string XdgFolders::*folder;
