@@ -76,6 +76,8 @@ TEST(MovieHandler, CountsPurchasesOnTopOfThePlace) {
       {"nor the other", "/x/a.mkv", true, true, false, false},
       {"but in another case", "/x/a.AVI", false, true, true, true},
       {"and when the name goes on", "/x/a.mkv.mp4", false, true, true, true},
+      {"and without the point", "/x/amkv", true, false, true, false},
+      {"or the other form's letters", "/x/aavi", true, false, true, false},
   };
   for (const auto& row : rows) {
     MediaWorld world(movies, {row.path, 7, row.hasPurchaseDate, row.holdsPurchaseItem}, Library::none);

@@ -5,6 +5,7 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <vector>
 
 #include "platform/ResourceValues.h"
 #include "tests/support/CallJournal.h"
