@@ -51,14 +51,14 @@ TEST(BadInput, OtherPreferencesSurvive) {
             json::parse(R"({"Other": [1, "two"], "LastVersionRun": 4})"));
 }
 
-TEST(BadInput, WithoutUsableBackupSettingsNoVolumeIsMeasured) {
-  for (const char* settings :
-       {"", "no settings at all", "[Backup]\nAutomaticBackups=perhaps\n", "[Backup\n"}) {
+TEST(BadInput, MalformedBackupSettingsLeaveEveryVolumeOut) {
+  for (const char* malformed :
+       {"no settings at all\n", "AutomaticBackups=perhaps\n", "[Backup\n", "\xff\xfe\n"}) {
     AgentWorld world;
-    AgentWorld::write(world.backupSettingsFile(), std::string(settings) + "IncludedVolumes=\n");
-    EXPECT_EQ(world.run({"--force"}), 0) << settings;
-    ASSERT_EQ(world.messages().size(), 2U) << settings;
-    EXPECT_EQ(json::parse(world.messages()[0])["pairs"][0][1], "0") << settings;
+    AgentWorld::write(world.backupSettingsFile(), std::string("[Backup]\nIncludedVolumes=/\n") + malformed);
+    EXPECT_EQ(world.run({"--force"}), 0) << malformed;
+    ASSERT_EQ(world.messages().size(), 2U) << malformed;
+    EXPECT_EQ(json::parse(world.messages()[0])["pairs"][0][1], "0") << malformed;
   }
 }
 

@@ -1,6 +1,8 @@
 // The real program, started by hand without --force: it waits for the signal that lets it run.
 #include <gtest/gtest.h>
 
+#include <unistd.h>
+
 #include <csignal>
 
 #include "AgentWorld.h"
@@ -16,7 +18,7 @@ int runScheduled(AgentWorld& world, const std::vector<std::string>& arguments) {
     sigemptyset(&run);
     sigaddset(&run, SIGUSR1);
     sigprocmask(SIG_BLOCK, &run, nullptr);
-    raise(SIGUSR1);
+    kill(getpid(), SIGUSR1);  // not raise(): that would be for this thread alone
   };
   return world.run(arguments);
 }
