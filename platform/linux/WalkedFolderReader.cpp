@@ -7,7 +7,7 @@
 
 #include "platform/linux/CallablePath.h"
 #include "platform/linux/ItemAttributes.h"
-#include "platform/linux/Packages.h"
+#include "platform/linux/PackageMark.h"
 
 namespace norvex {
 namespace {
