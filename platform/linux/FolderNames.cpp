@@ -10,7 +10,7 @@
 namespace norvex {
 namespace {
 
-// Room for the entries of an ordinary folder in one call, and what is kept between folders.
+// Room for the entries of an ordinary folder in one call.
 constexpr std::size_t kUsualSize = std::size_t{128} << 10U;
 // The least that is offered to the kernel: an entry must fit, and a large folder should take few calls.
 constexpr std::size_t kLeastRoom = std::size_t{64} << 10U;
@@ -46,11 +46,7 @@ int FolderNames::read(int folder) {
 }
 
 int FolderNames::readRecords(int folder) {
-  // A huge folder's memory is not kept for the small ones that follow.
-  if (records_.size() != kUsualSize) {
-    records_ = std::vector<char>(kUsualSize);
-    sorted_.shrink_to_fit();
-  }
+  if (records_.empty()) records_.resize(kUsualSize);
   recordsEnd_ = 0;
   for (;;) {
     if (records_.size() - recordsEnd_ < kLeastRoom) records_.resize(records_.size() * 2);

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-#include "platform/linux/Packages.h"
+#include "platform/PackageNames.h"
 #include "platform/linux/ReadAhead.h"
 
 namespace norvex {

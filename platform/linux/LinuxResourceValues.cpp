@@ -4,10 +4,11 @@
 
 #include <cerrno>
 
+#include "platform/PackageNames.h"
 #include "platform/linux/CallablePath.h"
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/ItemAttributes.h"
-#include "platform/linux/Packages.h"
+#include "platform/linux/PackageMark.h"
 #include "platform/linux/VolumeStatistics.h"
 
 namespace norvex {

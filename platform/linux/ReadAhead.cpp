@@ -97,13 +97,24 @@ void ReadAhead::read(WalkedFolder& folder, WalkedFolderReader& reader, Lock& loc
   if (folder.parent == nullptr) {
     result = reader.readRoot(folder, rootPath_);
   } else if (parent) {
-    result = reader.read(folder, *parent);
+    result = readBelow(*parent, folder, reader);
   }
   parent = nullptr;
   if (result.subfolders.empty()) result.descriptor = FileDescriptor();
   folder.memory = memoryOf(folder, result);
   lock.lock();
   publish(folder, std::move(result));
+}
+
+ReadFolder ReadAhead::readBelow(const FileDescriptor& parent, WalkedFolder& folder,
+                                WalkedFolderReader& reader) {
+  ReadFolder result = reader.read(folder, parent);
+  if (folder.error != EMFILE && folder.error != ENFILE) return result;
+  {
+    const Lock lock(mutex_);
+    descriptors_.makeRoom();
+  }
+  return reader.read(folder, parent);
 }
 
 void ReadAhead::publish(WalkedFolder& folder, ReadFolder result) {

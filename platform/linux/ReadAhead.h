@@ -47,6 +47,7 @@ class ReadAhead {
   bool mayReadOn() const { return unread_ > 0 && bytesAhead_ < kMostBytesAhead; }
   WalkedFolder& claim();
   void read(WalkedFolder& folder, WalkedFolderReader& reader, Lock& lock);
+  ReadFolder readBelow(const FileDescriptor& parent, WalkedFolder& folder, WalkedFolderReader& reader);
   void publish(WalkedFolder& folder, ReadFolder result);
   void wakeHelper();
 

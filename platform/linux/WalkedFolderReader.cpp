@@ -7,7 +7,7 @@
 
 #include "platform/linux/CallablePath.h"
 #include "platform/linux/ItemAttributes.h"
-#include "platform/linux/Packages.h"
+#include "platform/linux/PackageMark.h"
 
 namespace norvex {
 namespace {
@@ -63,6 +63,7 @@ ReadFolder WalkedFolderReader::readRoot(WalkedFolder& root, const std::string& p
 }
 
 void WalkedFolderReader::readOpen(WalkedFolder& folder, ReadFolder& result) {
+  forgetHugeFolder();
   items_.clear();
   names_.clear();
   folder.error = listed_.read(result.descriptor.number());
@@ -98,6 +99,15 @@ void WalkedFolderReader::readItem(WalkedFolder& folder, const char* name, ReadFo
   }
   items_.push_back(item);
   names_.insert(names_.end(), name, name + nameLength + 1);
+}
+
+// A huge folder's memory is not kept for the small ones that follow.
+void WalkedFolderReader::forgetHugeFolder() {
+  constexpr std::size_t kMostItemsKept = 4096;
+  if (items_.capacity() <= kMostItemsKept) return;
+  listed_ = FolderNames();
+  items_ = std::vector<WalkedItem>();
+  names_ = std::vector<char>();
 }
 
 }  // namespace norvex

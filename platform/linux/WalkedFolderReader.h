@@ -33,13 +33,14 @@ class WalkedFolderReader {
   ReadFolder readRoot(WalkedFolder& root, const std::string& path);
 
  private:
+  void forgetHugeFolder();
   void readOpen(WalkedFolder& folder, ReadFolder& result);
   void readItem(WalkedFolder& folder, const char* name, ReadFolder& result);
 
   const bool marksWanted_;
-  FolderNames listed_;
   NamedStreams streams_;
-  // What becomes the folder's own when its size is known.
+  // Of the folder that is being read, until what is needed of it becomes its own in the size that it takes.
+  FolderNames listed_;
   std::vector<WalkedItem> items_;
   std::vector<char> names_;
 };
