@@ -1,7 +1,5 @@
 #include "index/GlobPattern.h"
 
-#include <cstddef>
-
 namespace norvex {
 namespace {
 
@@ -85,6 +83,13 @@ bool globMatches(std::string_view pattern, std::string_view name) {
     inName = ++starEnd;
   }
   return pattern.find_first_not_of('*', inPattern) == none;
+}
+
+std::size_t globElementLength(std::string_view pattern) {
+  if (pattern.empty()) return 0;
+  if (pattern[0] == '\\' && pattern.size() > 1) return 2;
+  const std::size_t bracket = pattern[0] == '[' ? bracketLength(pattern) : none;
+  return bracket == none ? 1 : bracket;
 }
 
 bool hasGlobCharacters(std::string_view pattern) {

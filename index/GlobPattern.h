@@ -5,6 +5,7 @@
 // up for ever.
 #pragma once
 
+#include <cstddef>
 #include <string_view>
 
 namespace norvex {
@@ -13,6 +14,10 @@ namespace norvex {
 // character; `[abc]`, `[a-z]`, `[!a-z]` one byte of a set; `\` takes the next character as it is. A bracket
 // that is never closed stands for itself. Time is bounded by the product of the two lengths.
 bool globMatches(std::string_view pattern, std::string_view name);
+
+// How many bytes the pattern's first element has: a star, a question mark, a closed bracket, a quoted or a
+// plain character. 0 for an empty pattern only.
+std::size_t globElementLength(std::string_view pattern);
 
 // Whether the pattern has any character of a special meaning; without one it matches only itself.
 bool hasGlobCharacters(std::string_view pattern);

@@ -22,7 +22,10 @@ namespace {
 
 constexpr unsigned highestWeight = 100;
 constexpr std::string_view noGlobs = "__NOGLOBS__";
-constexpr char anyCharacter = '*';
+
+constexpr std::size_t byteOf(char character) {
+  return static_cast<unsigned char>(character);
+}
 
 std::string_view takeField(std::string_view& rest, char separator) {
   const std::size_t end = rest.find(separator);
@@ -72,27 +75,27 @@ std::uint64_t rankOf(unsigned weight, std::size_t length, std::uint32_t line) {
          (std::numeric_limits<std::uint32_t>::max() - line);
 }
 
-// The longest run of plain characters. Brackets and quotings end the search: what follows is not needed.
-std::string longestLiteralRun(std::string_view pattern) {
-  pattern = pattern.substr(0, pattern.find_first_of("[\\"));
-  std::string_view longest;
-  while (!pattern.empty()) {
-    const std::size_t end = pattern.find_first_of("*?");
-    const std::string_view run = pattern.substr(0, end);
-    if (run.size() > longest.size()) longest = run;
-    pattern = end == std::string_view::npos ? std::string_view() : pattern.substr(end + 1);
+// The ends of a pattern and the longest text between its special characters.
+struct Landmarks {
+  std::string_view firstElement;
+  std::string_view lastElement;
+  std::string_view literalRun;
+};
+
+Landmarks landmarksOf(std::string_view pattern) {
+  Landmarks marks{pattern.substr(0, globElementLength(pattern)), {}, {}};
+  std::size_t runStart = 0;
+  for (std::size_t at = 0; at < pattern.size();) {
+    const std::size_t length = globElementLength(pattern.substr(at));
+    marks.lastElement = pattern.substr(at, length);
+    at += length;
+    if (hasGlobCharacters(marks.lastElement)) {
+      runStart = at;
+    } else if (at - runStart > marks.literalRun.size()) {
+      marks.literalRun = pattern.substr(runStart, at - runStart);
+    }
   }
-  return std::string(longest);
-}
-
-char literalFirst(std::string_view pattern) {
-  return hasGlobCharacters(pattern.substr(0, 1)) ? anyCharacter : pattern.front();
-}
-
-// A pattern with brackets or quotings is not looked at from its end: its last character may mean another.
-char literalLast(std::string_view pattern) {
-  if (pattern.find_first_of("[\\") != std::string_view::npos || pattern.back() == '?') return anyCharacter;
-  return pattern.back();
+  return marks;
 }
 
 }  // namespace
@@ -157,6 +160,7 @@ void MimeGlobs::add(const Entry& entry, std::uint32_t line) {
   const Choice choice{rankOf(entry.weight, pattern.size(), line), *number};
   if (!hasGlobCharacters(pattern)) {
     offer(names_, pattern, choice, entry.caseSensitive);
+    firstOfNames_.set(byteOf(pattern.front()));
   } else if (pattern.starts_with("*.") && !hasGlobCharacters(std::string_view(pattern).substr(1))) {
     offer(suffixes_, std::string_view(pattern).substr(1), choice, entry.caseSensitive);
     longestSuffix_ = std::max(longestSuffix_, pattern.size() - 1);
@@ -167,13 +171,25 @@ void MimeGlobs::add(const Entry& entry, std::uint32_t line) {
   ++patternCount_;
 }
 
+// The bytes that a name can begin or end with to fit an element that stands at that end of a pattern.
+MimeGlobs::ByteSet MimeGlobs::bytesFitting(std::string_view element) {
+  ByteSet bytes;
+  if (element == "*" || element == "?") return bytes.set();
+  for (unsigned byte = 0; byte < bytes.size(); ++byte) {
+    const char character = static_cast<char>(byte);
+    bytes[byte] = globMatches(element, std::string_view(&character, 1));
+  }
+  return bytes;
+}
+
 void MimeGlobs::addWildcard(std::string_view pattern, const Choice& choice, bool caseSensitive) {
-  wildcards_.push_back({.pattern = std::string(pattern),
-                        .literalRun = longestLiteralRun(pattern),
-                        .first = literalFirst(pattern),
-                        .last = literalLast(pattern),
-                        .choice = choice,
-                        .caseSensitive = caseSensitive});
+  const Landmarks marks = landmarksOf(pattern);
+  wildcards_.push_back({.choice = choice,
+                        .caseSensitive = caseSensitive,
+                        .first = bytesFitting(marks.firstElement),
+                        .last = bytesFitting(marks.lastElement),
+                        .literalRun = std::string(marks.literalRun),
+                        .pattern = std::string(pattern)});
 }
 
 void MimeGlobs::offer(ChoiceTable& table, std::string_view key, const Choice& choice, bool caseSensitive) {
@@ -201,14 +217,14 @@ MimeGlobs::Choice MimeGlobs::bestSuffix(std::string_view name, Spelling spelling
 
 // Tells most names from most patterns without matching them.
 bool MimeGlobs::mayFit(const Wildcard& wildcard, std::string_view name) {
-  if (wildcard.first != anyCharacter && wildcard.first != name.front()) return false;
-  if (wildcard.last != anyCharacter && wildcard.last != name.back()) return false;
-  return name.find(wildcard.literalRun) != name.npos;
+  return wildcard.last[byteOf(name.back())] && wildcard.first[byteOf(name.front())] &&
+         name.find(wildcard.literalRun) != name.npos;
 }
 
 MimeGlobs::Choice MimeGlobs::best(std::string_view name, Spelling spelling) const {
   Choice best = bestSuffix(name, spelling);
-  const Choice* const whole = find(names_, name, spelling);
+  // Few names are in the table, and hashing a whole name costs more than all of its suffixes.
+  const Choice* const whole = firstOfNames_[byteOf(name.front())] ? find(names_, name, spelling) : nullptr;
   if (whole != nullptr && whole->rank > best.rank) best = *whole;
   for (const Wildcard& wildcard : wildcards_) {
     if (wildcard.choice.rank < best.rank) break;

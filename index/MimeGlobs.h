@@ -3,6 +3,7 @@
 // Filled once by ContentTypes; afterwards only read, then by any number of threads at once.
 #pragma once
 
+#include <bitset>
 #include <cstddef>
 #include <cstdint>
 #include <optional>
@@ -55,13 +56,15 @@ class MimeGlobs {
     Choice asWritten;
     Choice lowered;
   };
+  using ByteSet = std::bitset<256>;
+  // A pattern that is matched against a name only when the name's ends and length allow it to fit.
   struct Wildcard {
-    std::string pattern;
-    std::string literalRun;  // every fitting name holds it
-    char first = '*';        // '*' stands for any
-    char last = '*';
     Choice choice;
     bool caseSensitive = false;
+    ByteSet first;
+    ByteSet last;
+    std::string literalRun;  // every fitting name holds it
+    std::string pattern;
   };
   struct TextHash {
     using is_transparent = void;
@@ -77,6 +80,7 @@ class MimeGlobs {
   std::optional<TypeNumber> numberOf(std::string_view type);
 
   static const Choice* find(const ChoiceTable& table, std::string_view key, Spelling spelling);
+  static ByteSet bytesFitting(std::string_view element);
   static bool mayFit(const Wildcard& wildcard, std::string_view name);
   Choice best(std::string_view name, Spelling spelling) const;
   Choice bestSuffix(std::string_view name, Spelling spelling) const;
@@ -84,7 +88,8 @@ class MimeGlobs {
   std::vector<std::string> types_;
   std::unordered_map<std::string, TypeNumber, TextHash, std::equal_to<>> numbers_;
   std::unordered_set<std::string, TextHash, std::equal_to<>> closedTypes_;
-  ChoiceTable names_;                // whole names
+  ChoiceTable names_;  // whole names
+  ByteSet firstOfNames_;
   ChoiceTable suffixes_;             // ".ext" of the patterns "*.ext"
   std::vector<Wildcard> wildcards_;  // all others, the highest rank first
   std::size_t longestSuffix_ = 0;
