@@ -55,7 +55,9 @@ std::partial_ordering compareMixed(std::int64_t whole, double real) {
 }
 
 std::partial_ordering reversed(std::partial_ordering order) {
-  return 0 <=> order;
+  if (std::is_lt(order)) return std::partial_ordering::greater;
+  if (std::is_gt(order)) return std::partial_ordering::less;
+  return order;
 }
 
 }  // namespace

@@ -22,19 +22,22 @@ bool continuesCharacter(char c) {
   return (static_cast<unsigned char>(c) & 0xC0U) == 0x80;
 }
 
-// The beginning of a token as it can be shown on a terminal: what is not printable there becomes "?".
+// The beginning of a token as it can be shown on a terminal: control characters, also those of two bytes, and
+// what is no character at all become "?".
 std::string shown(std::string_view token) {
   constexpr std::size_t limit = 24;
   const bool isUtf8 = isValidUtf8(token);
-  const bool isCut = token.size() > limit;
   std::size_t length = std::min(token.size(), limit);
-  if (isUtf8) {
-    while (length < token.size() && continuesCharacter(token[length])) --length;
-  }
+  while (isUtf8 && length < token.size() && continuesCharacter(token[length])) --length;
   std::string text(token.substr(0, length));
-  std::ranges::replace_if(
-      text, [&](char c) { return (c >= 0 && c < ' ') || c == 0x7F || (c < 0 && !isUtf8); }, '?');
-  return isCut ? text + "..." : text;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    const auto byte = static_cast<unsigned char>(text[i]);
+    const bool followsC2 = i > 0 && token[i - 1] == '\xc2';
+    const bool isControl = byte < 0x20 || byte == 0x7F || (followsC2 && byte < 0xA0);
+    if (isControl && followsC2) text[i - 1] = '?';
+    if (isControl || (byte >= 0x80 && !isUtf8)) text[i] = '?';
+  }
+  return length < token.size() ? text + "..." : text;
 }
 
 // Recursive descent: one method a rule of the language, absent when error_ says why. The depth of the
@@ -48,13 +51,6 @@ class Parser {
     if (predicate && token_.kind != Kind::End) predicate = failed("&&, || or the end");
     if (!predicate) return std::move(error_);
     return std::move(*predicate);
-  }
-
-  PredicateError errorAt(std::size_t offset, std::string_view expected, std::string_view found) const {
-    const std::size_t column = columnOf(offset);
-    const std::string instead = found.empty() ? "the predicate ends there" : "found: " + shown(found);
-    return {column, std::string(expected),
-            "column " + std::to_string(column) + ": expected " + std::string(expected) + ", but " + instead};
   }
 
  private:
@@ -178,6 +174,13 @@ class Parser {
     const bool isBroken = token_.kind == Kind::Broken;
     error_ = errorAt(token_.offset, isBroken ? token_.expected : expected, token_.source);
     return std::nullopt;
+  }
+
+  PredicateError errorAt(std::size_t offset, std::string_view expected, std::string_view found) const {
+    const std::size_t column = columnOf(offset);
+    const std::string instead = found.empty() ? "the predicate ends there" : "found: " + shown(found);
+    return {column, std::string(expected),
+            "column " + std::to_string(column) + ": expected " + std::string(expected) + ", but " + instead};
   }
 
   std::size_t columnOf(std::size_t offset) const {

@@ -1,20 +1,22 @@
 #include "index/ValueComparison.h"
 
+#include <compare>
+
 namespace norvex {
 namespace {
 
 bool fulfils(PredicateOperator comparison, std::partial_ordering order) {
   switch (comparison) {
     case PredicateOperator::Equal:
-      return order == 0;
+      return std::is_eq(order);
     case PredicateOperator::Less:
-      return order < 0;
+      return std::is_lt(order);
     case PredicateOperator::LessOrEqual:
-      return order <= 0;
+      return std::is_lteq(order);
     case PredicateOperator::Greater:
-      return order > 0;
+      return std::is_gt(order);
     case PredicateOperator::GreaterOrEqual:
-      return order >= 0;
+      return std::is_gteq(order);
   }
   return false;
 }

@@ -217,6 +217,7 @@ TEST(PredicateParser, WritesTheErrorAsALineForPeople) {
       {"kMDItemKind = ",
        "column 15: expected a value (a string in quotes, a number or *), but the predicate ends there"},
       {"a == 1 b == 2", "column 8: expected &&, || or the end, but found: b"},
+      {"a == x\xc2\x9b", "column 6: expected a value (a string in quotes, a number or *), but found: x??"},
       {"a == 1 \x1b[31m", "column 8: expected &&, || or the end, but found: ?"},
       {"a == 'x'w\xff",
        "column 9: expected the modifiers c (any case), d (any diacritics) or none, but found: w?"},
@@ -251,7 +252,7 @@ TEST(PredicateParser, SurvivesHostileText) {
   for (const std::string unit :
        {"(", "!", "((!", "a=", "a=1||", "'", "\\", "'\\", "InRange(", "not ", "\xff", "*", "-"}) {
     EXPECT_GT(errorOf(repeated(unit, 3000)).column, 0U) << unit;
-    EXPECT_GT(errorOf(repeated(unit, 3'000'000)).column, 0U) << unit;
+    EXPECT_GT(errorOf(repeated(unit, 300'000)).column, 0U) << unit;
   }
 }
 

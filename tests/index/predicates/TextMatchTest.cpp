@@ -120,6 +120,23 @@ TEST(TextMatcher, KeepsBytesThatAreNoText) {
   });
 }
 
+TEST(TextMatcher, TakesMarksInAnyOrderAndNumber) {
+  const std::string above = "\u0301";
+  const std::string below = "\u0323";
+  std::string grouped = "a";
+  std::string alternating = "a";
+  for (int i = 0; i < 16'000; ++i) alternating += above + below;
+  for (int i = 0; i < 16'000; ++i) grouped += above;
+  for (int i = 0; i < 16'000; ++i) grouped += below;
+  check({
+      {"a" + above + below, kAnyCase, "A" + below + above, true},
+      {"a" + above + below, kExact, "a" + below + above, false},
+      {grouped, kAnyCase, alternating, true},
+      {"a", kAnyMark, alternating, true},
+      {"a", kAnyCase, alternating, false},
+  });
+}
+
 TEST(TextMatcher, OrdersByTheBytesOfTheFoldedForms) {
   const auto order = [](const std::string& pattern, TextFolding folding, const std::string& text) {
     return TextMatcher(patternFromSource(pattern, folding)).compare(text);
