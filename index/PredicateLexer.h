@@ -15,7 +15,7 @@ struct PredicateToken {
     End,
     Attribute,
     Value,     // a text or a number: `literal`
-    Anything,  // * outside of quotes
+    Anything,  // * outside of quotes; `literal` is AnyValue
     Operator,  // `comparison` and `isNegated`
     And,
     Or,

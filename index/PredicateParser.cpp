@@ -137,8 +137,7 @@ class Parser {
   }
 
   std::optional<PredicateLiteral> valueOrAny() {
-    if (accept(Kind::Anything)) return PredicateLiteral{AnyValue{}};
-    if (token_.kind != Kind::Value) return failed(kExpectedValueOrAny);
+    if (token_.kind != Kind::Value && token_.kind != Kind::Anything) return failed(kExpectedValueOrAny);
     return takeLiteral();
   }
 
