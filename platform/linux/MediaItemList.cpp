@@ -4,6 +4,7 @@
 #include <array>
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <utility>
 
 #include "platform/linux/BoxReader.h"
@@ -105,7 +106,10 @@ std::string Walk::freeFormKey(const Box& item) {
     if (child->type == kFreeFormName) name = text(*child);
     at = child->end;
   }
-  return domain + (domain.empty() || name.empty() ? "" : ":") + name;
+  const std::string_view between = domain.empty() || name.empty() ? "" : ":";
+  std::string key;
+  key.reserve(domain.size() + between.size() + name.size());
+  return key.append(domain).append(between).append(name);
 }
 
 std::string Walk::text(const Box& box) {
