@@ -45,7 +45,7 @@ class Walk {
   }
 
  private:
-  void enter(const Box& parent, std::size_t level);
+  bool enter(const Box& parent, std::size_t level);
   void readItems(const Box& list);
   MediaItemKey keyOf(const Box& item);
   std::string freeFormKey(const Box& item);
@@ -56,16 +56,18 @@ class Walk {
   std::vector<MediaItemKey> keys_;
 };
 
-void Walk::enter(const Box& parent, std::size_t level) {
+// Whether there was a list: then the walk is over.
+bool Walk::enter(const Box& parent, std::size_t level) {
   if (level == kWayToItems.size()) {
     readItems(parent);
-    return;
+    return true;
   }
   std::uint64_t at = firstChild(parent);
   while (const auto child = reader_.boxAt(at, parent)) {
-    if (child->type == kWayToItems[level]) enter(*child, level + 1);
+    if (child->type == kWayToItems[level] && enter(*child, level + 1)) return true;
     at = child->end;
   }
+  return false;
 }
 
 // The metadata box comes in two forms: with version and flags before its children, and without. Read as the

@@ -94,9 +94,11 @@ std::vector<Case> layouts() {
                box("moov",
                    {box("free", {}), box("udta", {box("name", {"x"}), versioned, box("free", {samples})})})}),
        kListed},
-      {"EachListOfTheMovie",
-       box("moov", {userData(versioned), userData(versioned)}),
-       {"one ", "purd", "one ", "purd"}},
+      {"OnlyTheFirstList", box("moov", {userData(versioned), userData(versioned)}), kListed},
+      {"AListInTheSecondPlaceOfEach",
+       box("moov",
+           {box("udta", {}), box("udta", {box("meta", {}), box("meta", {version0, handler()}), versioned})}),
+       kListed},
       {"OnlyTheFirstMovie", joined({movie({item("one ")}), movie({item("two ")})}), {"one "}},
       {"NoItems", movie({}), kNone},
       {"AnItemWithoutValue", movie({box("purd", {})}), {"purd"}},
@@ -216,11 +218,8 @@ std::vector<Case> damagedFiles() {
                      movie({box("----", {box("mean", {version0, "D"}), bad, box("name", {version0, "N"})}),
                             item("two ")}),
                      {"\"D\"", "two "}});
-    cases.push_back(
-        {"BeforeAnotherList" + name,
-         box("moov",
-             {userData(box("meta", {version0, box("ilst", {item("one "), bad, item("two ")})})), good}),
-         {"one ", "one ", "purd"}});
+    cases.push_back({"BeforeAnotherUserData" + name,
+                     box("moov", {box("udta", {bad, box("meta", {version0, list()})}), good}), kListed});
   }
   return cases;
 }

@@ -9,6 +9,7 @@
 #include <fstream>
 #include <nlohmann/json.hpp>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "media/Boxes.h"
@@ -95,6 +96,30 @@ TEST(MediaWriters, MakeMediaHasWrittenWhatIsReadAndNothingIsReadOfItsDamagedFile
   }
   EXPECT_GT(whole, 200);
   EXPECT_GT(damaged, 30);
+}
+
+// --- files that ffmpeg and mutagen once wrote
+
+TEST(MediaWriters, OtherProgramsHaveWrittenTheKeysThatAreRead) {
+  const std::vector<std::string> ffmpegWrites = {"\xA9nam",
+                                                 "\xA9"
+                                                 "ART",
+                                                 "\xA9too"};
+  const std::vector<std::pair<std::string, std::vector<std::string>>> files = {
+      {"movie-last.m4a", ffmpegWrites},
+      {"movie-first.m4a", ffmpegWrites},
+      {"fragments.mp4", ffmpegWrites},
+      {"numbered-keys.mp4", {bigEndianText(1, 4), bigEndianText(2, 4), bigEndianText(3, 4)}},
+      {"quicktime.mov", {}},
+      {"retagged.m4a",
+       {"\xA9nam",
+        "\xA9"
+        "ART",
+        "\xA9too", "\"org.example:MOOD\"", "covr", "purd"}},
+  };
+  for (const auto& [name, keys] : files) {
+    EXPECT_EQ(keysOf(NORVEX_SOURCE_DIR "/tests/linux/media/files/" + name), keys) << name;
+  }
 }
 
 // --- AtomicParsley, a tagging program of others

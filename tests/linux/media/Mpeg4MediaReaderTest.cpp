@@ -44,6 +44,25 @@ class Mpeg4MediaReaderTest : public testing::Test {
   Mpeg4MediaReader reader_;
 };
 
+// For as long as it lives a test that runs as root is an ordinary user who may look into the folder.
+class WithoutRootsRights {
+ public:
+  explicit WithoutRootsRights(const TempFolder& folder) {
+    if (!wasRoot_) return;
+    EXPECT_EQ(::chmod((folder / "").c_str(), 0755), 0);
+    EXPECT_EQ(::seteuid(kNobody), 0);
+  }
+  WithoutRootsRights(const WithoutRootsRights&) = delete;
+  WithoutRootsRights& operator=(const WithoutRootsRights&) = delete;
+  ~WithoutRootsRights() {
+    if (wasRoot_) EXPECT_EQ(::seteuid(0), 0);
+  }
+
+ private:
+  static constexpr uid_t kNobody = 65534;
+  const bool wasRoot_ = ::geteuid() == 0;
+};
+
 const Bytes purchased = joined({fileType(), movie({item("one "), item("purd")})});
 
 TEST_F(Mpeg4MediaReaderTest, ReadsTheKeysOfAFile) {
@@ -76,10 +95,17 @@ TEST_F(Mpeg4MediaReaderTest, FindsNothingInWhatIsNoMediaFile) {
 }
 
 TEST_F(Mpeg4MediaReaderTest, FindsNothingInAFileThatMayNotBeRead) {
-  if (::geteuid() == 0) GTEST_SKIP() << "root may read every file";
   const std::string path = write("song.m4a", purchased);
   ASSERT_EQ(::chmod(path.c_str(), 0), 0);
+  const WithoutRootsRights limited(folder_);
   EXPECT_THAT(keysOf(path), IsEmpty());
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFileOfAnotherUser) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root can make a file of another user";
+  const std::string path = write("song.m4a", purchased);
+  const WithoutRootsRights limited(folder_);
+  EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
 }
 
 TEST_F(Mpeg4MediaReaderTest, FollowsNoLink) {
