@@ -55,7 +55,8 @@ class WithoutRootsRights {
   WithoutRootsRights(const WithoutRootsRights&) = delete;
   WithoutRootsRights& operator=(const WithoutRootsRights&) = delete;
   ~WithoutRootsRights() {
-    if (wasRoot_) EXPECT_EQ(::seteuid(0), 0);
+    if (!wasRoot_) return;
+    EXPECT_EQ(::seteuid(0), 0);
   }
 
  private:
