@@ -20,7 +20,7 @@
 #include "platform/linux/LinuxUserFolders.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
 #include "platform/linux/MarkerFileInstallation.h"
-#include "platform/linux/NoMediaMetadata.h"
+#include "platform/linux/Mpeg4MediaReader.h"
 #include "platform/linux/ProcStatusMemoryInfo.h"
 #include "platform/linux/SilentMemoryPressureSource.h"
 #include "platform/linux/StatvfsVolumeCatalog.h"
@@ -61,7 +61,7 @@ class LinuxPlatform {
   LinuxFileExistence fileExistence_;
   MarkerFileInstallation installation_;
   AbsentJobRegistry jobRegistry_;
-  NoMediaMetadata mediaMetadataReader_;
+  Mpeg4MediaReader mediaMetadataReader_;
   SilentMemoryPressureSource memoryPressureSource_;
   JsonPreferenceStore preferenceStore_;
   ProcStatusMemoryInfo processMemoryInfo_;

@@ -1,0 +1,14 @@
+#include "platform/linux/Mpeg4MediaReader.h"
+
+#include "platform/linux/MediaItemList.h"
+#include "platform/linux/RegularFile.h"
+
+namespace norvex {
+
+std::vector<MediaItemKey> Mpeg4MediaReader::itemKeys(const Location& file) {
+  auto opened = RegularFile::open(file.path());
+  if (!opened) return {};
+  return mediaItemKeys(*opened);
+}
+
+}  // namespace norvex

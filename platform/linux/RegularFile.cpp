@@ -1,0 +1,50 @@
+#include "platform/linux/RegularFile.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+
+namespace norvex {
+namespace {
+
+constexpr int kOpenFlags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
+
+// The only place that uses the path.
+FileDescriptor openForReading(const std::string& path) {
+  // Asked before opening, since the opening itself releases whoever waits at the other end of a FIFO.
+  struct stat attributes = {};
+  if (::fstatat(AT_FDCWD, path.c_str(), &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
+  if (!S_ISREG(attributes.st_mode)) return {};
+
+  FileDescriptor file(::openat(AT_FDCWD, path.c_str(), kOpenFlags | O_NOATIME));
+  // Only the owner of a file may leave its time of last access alone.
+  if (!file && errno == EPERM) file = FileDescriptor(::openat(AT_FDCWD, path.c_str(), kOpenFlags));
+  return file;
+}
+
+}  // namespace
+
+std::optional<RegularFile> RegularFile::open(const std::string& path) {
+  FileDescriptor file = openForReading(path);
+  if (!file) return std::nullopt;
+  // Asked of what was opened: something else may have taken the name in between.
+  struct stat attributes = {};
+  if (::fstat(file.number(), &attributes) != 0 || !S_ISREG(attributes.st_mode)) return std::nullopt;
+  return RegularFile(std::move(file), static_cast<std::uint64_t>(attributes.st_size));
+}
+
+std::size_t RegularFile::read(std::uint64_t offset, std::span<char> buffer) {
+  std::size_t filled = 0;
+  while (filled < buffer.size()) {
+    const auto rest = buffer.subspan(filled);
+    const auto got = ::pread(file_.number(), rest.data(), rest.size(), static_cast<off_t>(offset + filled));
+    if (got < 0 && errno == EINTR) continue;
+    if (got <= 0) break;
+    filled += static_cast<std::size_t>(got);
+  }
+  return filled;
+}
+
+}  // namespace norvex

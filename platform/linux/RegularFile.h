@@ -1,0 +1,34 @@
+// A regular file that is open for reading at any offset.
+//
+// Owned by one object on one thread at a time; closed with it.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <utility>
+
+#include "platform/linux/ByteSource.h"
+#include "platform/linux/FileDescriptor.h"
+
+namespace norvex {
+
+class RegularFile final : public ByteSource {
+ public:
+  // Nothing when there is no such file, when it may not be read, and when it is anything but a regular file:
+  // links are not followed, and opening a FIFO or a device would already be noticed at its other end. Never
+  // waits for anything but the disk. The file's time of last access stays as it was where the kernel allows
+  // that, which is for the user's own files.
+  static std::optional<RegularFile> open(const std::string& path);
+
+  // As of the opening.
+  std::uint64_t size() const override { return size_; }
+  std::size_t read(std::uint64_t offset, std::span<char> buffer) override;
+
+ private:
+  RegularFile(FileDescriptor file, std::uint64_t size) : file_(std::move(file)), size_(size) {}
+
+  FileDescriptor file_;
+  std::uint64_t size_;
+};
+
+}  // namespace norvex

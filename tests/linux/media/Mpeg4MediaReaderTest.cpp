@@ -1,0 +1,179 @@
+// The reader on real files.
+#include "platform/linux/Mpeg4MediaReader.h"
+
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/inotify.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/un.h>
+#include <unistd.h>
+
+#include <array>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+#include <vector>
+
+#include "media/Boxes.h"
+#include "media/TempFolder.h"
+#include "platform/linux/FileDescriptor.h"
+
+namespace norvex {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+class Mpeg4MediaReaderTest : public testing::Test {
+ protected:
+  std::vector<std::string> keysOf(const std::string& path) {
+    return shown(reader_.itemKeys(Location::file(path)));
+  }
+
+  // Writes the file into the test's folder; its path.
+  std::string write(const std::string& name, const Bytes& bytes) {
+    const std::string path = folder_ / name;
+    std::ofstream(path, std::ios::binary) << bytes.text();
+    return path;
+  }
+
+  TempFolder folder_;
+  Mpeg4MediaReader reader_;
+};
+
+// For as long as it lives a test that runs as root is an ordinary user who may look into the folder.
+class WithoutRootsRights {
+ public:
+  explicit WithoutRootsRights(const TempFolder& folder) {
+    if (!wasRoot_) return;
+    EXPECT_EQ(::chmod((folder / "").c_str(), 0755), 0);
+    EXPECT_EQ(::seteuid(kNobody), 0);
+  }
+  WithoutRootsRights(const WithoutRootsRights&) = delete;
+  WithoutRootsRights& operator=(const WithoutRootsRights&) = delete;
+  ~WithoutRootsRights() {
+    if (!wasRoot_) return;
+    EXPECT_EQ(::seteuid(0), 0);
+  }
+
+ private:
+  static constexpr uid_t kNobody = 65534;
+  const bool wasRoot_ = ::geteuid() == 0;
+};
+
+const Bytes purchased = joined({fileType(), movie({item("one "), item("purd")})});
+
+TEST_F(Mpeg4MediaReaderTest, ReadsTheKeysOfAFile) {
+  EXPECT_THAT(keysOf(write("song.m4a", purchased)), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFileWhoseMovieStandsBehindGigabytes) {
+  const std::string path = folder_ / "film.mp4";
+  const std::string head = wideBoxClaiming(16 + (std::uint64_t{6} << 30U), "mdat", {}).text();
+  const std::string tail = movie({item("purd")}).text();
+  const FileDescriptor file(::open(path.c_str(), O_CREAT | O_WRONLY | O_CLOEXEC, 0600));
+  ASSERT_EQ(::pwrite(file.number(), head.data(), head.size(), 0), static_cast<ssize_t>(head.size()));
+  ASSERT_EQ(::pwrite(file.number(), tail.data(), tail.size(), 16 + (off_t{6} << 30U)),
+            static_cast<ssize_t>(tail.size()));
+
+  EXPECT_THAT(keysOf(path), ElementsAre("purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsNamesThatAreNoText) {
+  EXPECT_THAT(keysOf(write("\xFF\n\x01.m4a", purchased)), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, FindsNothingInWhatIsNoMediaFile) {
+  EXPECT_THAT(keysOf(write("empty", {})), IsEmpty());
+  EXPECT_THAT(keysOf(write("text", "this is not a media file\n")), IsEmpty());
+  EXPECT_THAT(keysOf(folder_ / "missing"), IsEmpty());
+  EXPECT_THAT(keysOf(folder_ / ""), IsEmpty());
+  EXPECT_THAT(keysOf(write("song.m4a", purchased) + "/"), IsEmpty());
+  EXPECT_THAT(keysOf(""), IsEmpty());
+}
+
+TEST_F(Mpeg4MediaReaderTest, FindsNothingInAFileThatMayNotBeRead) {
+  const std::string path = write("song.m4a", purchased);
+  ASSERT_EQ(::chmod(path.c_str(), 0), 0);
+  const WithoutRootsRights limited(folder_);
+  EXPECT_THAT(keysOf(path), IsEmpty());
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFileOfAnotherUser) {
+  if (::geteuid() != 0) GTEST_SKIP() << "only root can make a file of another user";
+  const std::string path = write("song.m4a", purchased);
+  const WithoutRootsRights limited(folder_);
+  EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, FollowsNoLink) {
+  write("song.m4a", purchased);
+  std::filesystem::create_symlink("song.m4a", folder_ / "link.m4a");
+  EXPECT_THAT(keysOf(folder_ / "link.m4a"), IsEmpty());
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsThroughALinkToAFolderOnTheWay) {
+  write("song.m4a", purchased);
+  std::filesystem::create_directory_symlink(".", folder_ / "here");
+  EXPECT_THAT(keysOf(folder_ / "here/song.m4a"), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, LeavesAFifoUnopened) {
+  const std::string path = folder_ / "fifo.m4a";
+  ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
+  const FileDescriptor watch(::inotify_init1(IN_NONBLOCK | IN_CLOEXEC));
+  ASSERT_GE(::inotify_add_watch(watch.number(), path.c_str(), IN_OPEN), 0);
+
+  EXPECT_THAT(keysOf(path), IsEmpty());
+
+  std::array<char, 4096> events{};
+  EXPECT_EQ(::read(watch.number(), events.data(), events.size()), -1) << "somebody opened the FIFO";
+}
+
+TEST_F(Mpeg4MediaReaderTest, FindsNothingInASocketOrADevice) {
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  const std::string path = folder_ / "socket";
+  path.copy(address.sun_path, sizeof(address.sun_path) - 1);
+  const FileDescriptor socket(::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0));
+  ASSERT_EQ(::bind(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)), 0);
+
+  EXPECT_THAT(keysOf(path), IsEmpty());
+  EXPECT_THAT(keysOf("/dev/zero"), IsEmpty());
+}
+
+TEST_F(Mpeg4MediaReaderTest, LeavesTheTimeOfLastAccessAlone) {
+  const auto accessTimeOf = [](const std::string& path) {
+    struct stat attributes = {};
+    EXPECT_EQ(::stat(path.c_str(), &attributes), 0);
+    return attributes.st_atim.tv_sec;
+  };
+  const std::array<timespec, 2> longAgo = {timespec{1000000000, 0}, timespec{1000000001, 0}};
+  const std::string readByAnother = write("another.m4a", purchased);
+  const std::string path = write("song.m4a", purchased);
+  ASSERT_EQ(::utimensat(AT_FDCWD, readByAnother.c_str(), longAgo.data(), 0), 0);
+  ASSERT_EQ(::utimensat(AT_FDCWD, path.c_str(), longAgo.data(), 0), 0);
+  std::ifstream(readByAnother).get();
+  if (accessTimeOf(readByAnother) == longAgo[0].tv_sec) GTEST_SKIP() << "this volume keeps no access times";
+
+  EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+  EXPECT_EQ(accessTimeOf(path), longAgo[0].tv_sec);
+}
+
+TEST_F(Mpeg4MediaReaderTest, LeavesNoFileOpen) {
+  const auto openFiles = [] {
+    const std::filesystem::directory_iterator entries("/proc/self/fd");
+    return std::distance(begin(entries), end(entries));
+  };
+  const std::string good = write("song.m4a", purchased);
+  const std::string bad = write("text", "this is not a media file\n");
+  const auto before = openFiles();
+  for (const auto& path : {good, bad, folder_ / "missing", folder_ / ""}) keysOf(path);
+  EXPECT_EQ(openFiles(), before);
+}
+
+}  // namespace
+}  // namespace norvex
