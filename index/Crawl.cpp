@@ -3,13 +3,13 @@
 #include <algorithm>
 #include <cerrno>
 #include <deque>
-#include <limits>
 #include <memory>
 #include <thread>
 #include <utility>
 #include <vector>
 
 #include "index/CrawlWorkers.h"
+#include "index/FolderRules.h"
 
 namespace norvex {
 namespace {
@@ -17,14 +17,15 @@ namespace {
 // How far a folder's subfolders are known ahead, and how many folders on the way down are looked at for such.
 constexpr std::size_t kKnownAhead = 16;
 constexpr std::size_t kFoldersLookedAhead = 64;
-constexpr std::size_t kMostWaiting = 32;  // enough that no helper is ever idle
+constexpr std::size_t kFewWaiting = 8;  // below this more is given, so that no helper is ever idle
+constexpr std::size_t kMostWaiting = 32;
 constexpr std::size_t kMostHeldBytes = 8 * 1024 * 1024;
 
 // A subfolder whose turn comes.
 struct Child {
   std::int64_t id = 0;
   std::string name;
-  std::uint32_t type = 0;
+  TypeId type = 0;
   std::shared_ptr<CrawlFolderTask> task;  // once it is being read ahead
 };
 
@@ -32,17 +33,12 @@ struct Child {
 struct Frame {
   std::size_t pathLength = 0;
   CrawlPlace place;
-  bool isMailFolder = false;
+  MaildirSigns maildir;
   std::deque<Child> next;
   std::size_t given = 0;      // how many of these are being read ahead
   std::int64_t lookFrom = 0;  // further subfolders are among the items [lookFrom, lookEnd)
   std::int64_t lookEnd = 0;
 };
-
-std::int64_t saturatingSum(std::int64_t left, std::int64_t right) {
-  std::int64_t sum = 0;
-  return __builtin_add_overflow(left, right, &sum) ? std::numeric_limits<std::int64_t>::max() : sum;
-}
 
 class Crawl {
  public:
@@ -78,7 +74,9 @@ class Crawl {
     store_.add({0, {}, item.type, std::nullopt, item.mtime});
     writeAttributes(batch, kRootItem, 0);
     Child child{kRootItem, {}, item.type, nullptr};
-    child.task = std::make_shared<CrawlFolderTask>(std::string(), CrawlPlace{}, item.type);
+    const std::string name = volume_.root().substr(volume_.root().rfind('/') + 1);
+    const CrawlPlace place = rules_.placeInside(volume_.root(), name, CrawlPlace{}, false);
+    child.task = std::make_shared<CrawlFolderTask>(std::string(), place, item.type);
     workers_.give({child.task});
     return crawlFolder(std::move(child));
   }
@@ -112,9 +110,10 @@ class Crawl {
 
   // Gives the workers what comes next: the subfolders of the deepest folder, then of those around it.
   void readAhead() {
-    const CrawlWorkers::Load load = workers_.load();
-    const std::size_t most =
-        load.heldBytes < kMostHeldBytes && load.waiting < kMostWaiting ? kMostWaiting - load.waiting : 0;
+    const Frame& deepest = frames_.back();
+    if (deepest.given > 0 && workers_.waiting() > kFewWaiting) return;
+    const bool hasMemory = workers_.heldBytes() < kMostHeldBytes;
+    const std::size_t most = hasMemory ? kMostWaiting - std::min(kMostWaiting, workers_.waiting()) : 0;
     std::vector<std::shared_ptr<CrawlTask>> tasks;
     const std::size_t depth = std::min(kFoldersLookedAhead, frames_.size());
     for (std::size_t up = 0; up < depth; ++up) {
@@ -133,7 +132,7 @@ class Crawl {
     if (!path.empty()) path += '/';
     path += child.name;
     const CrawlPlace place =
-        rules_.placeInside(volume_.absolute(path), child.name, frame.place, frame.isMailFolder);
+        rules_.placeInside(volume_.absolute(path), child.name, frame.place, frame.maildir.isMaildir());
     child.task = std::make_shared<CrawlFolderTask>(std::move(path), place, child.type);
     return child.task;
   }
@@ -142,7 +141,7 @@ class Crawl {
     CrawlFolderTask& task = *child.task;
     if (!workers_.finish(task, cancelled_)) return systemError(ECANCELED);
     const std::int64_t first = store_.nextId();
-    Frame frame{task.path.size(), task.place, task.isMailFolder, {}, 0, 0, 0};
+    Frame frame{task.path.size(), task.place, {}, {}, 0, 0, 0};
     if (task.isLarge) {
       if (const auto large = crawlLargeFolder(child, frame); !large) return large;
     } else {
@@ -164,7 +163,6 @@ class Crawl {
       const auto names = std::make_shared<CrawlNamesTask>(*child.task, std::move(opened));
       workers_.give({names});
       if (!workers_.finish(*names, cancelled_)) return systemError(ECANCELED);
-      frame.isMailFolder |= names->isMailFolder;
       writeAttributes(names->batch, child.id, 0);
       opened = names->opened;
       if (opened != nullptr) {
@@ -222,8 +220,7 @@ class Crawl {
       } else {
         ++figures_.files;
         if (item.kind == CrawlItemKind::file) {
-          std::int64_t& sum = figures_.accumulatedSizes[item.sizePosition];
-          sum = saturatingSum(sum, item.size);
+          figures_.accumulatedSizes.add(item.position, static_cast<std::uint64_t>(item.size));
         }
       }
     }
@@ -233,6 +230,7 @@ class Crawl {
 
   void noteFolder(const CrawledItem& item, std::string_view name, std::int64_t id, Frame& frame) {
     ++figures_.folders;
+    frame.maildir.seeFolder(name);
     noteFolderType(item.type);
     if (item.kind == CrawlItemKind::border) {
       store_.addFolder(id, 0, 0, StoreFolderState::border);
@@ -246,8 +244,8 @@ class Crawl {
     frame.lookEnd = id + 1;
   }
 
-  void noteFolderType(std::uint32_t type) {
-    if (type >= isFolderType_.size()) isFolderType_.resize(type + 1);
+  void noteFolderType(TypeId type) {
+    if (type >= isFolderType_.size()) isFolderType_.resize(std::size_t{type} + 1);
     isFolderType_[type] = true;
   }
 
@@ -260,8 +258,9 @@ class Crawl {
 
   void writeTypes() {
     const std::vector<bool>& used = store_.usedTypes();
-    for (std::uint32_t type = 0; type < used.size(); ++type) {
-      if (used[type]) store_.addType(type, rules_.describe(type));
+    for (std::size_t type = 0; type < used.size(); ++type) {
+      if (used[type])
+        store_.addType(static_cast<TypeId>(type), rules_.types().type(static_cast<TypeId>(type)));
     }
   }
 

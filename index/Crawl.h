@@ -10,6 +10,7 @@
 #include <functional>
 #include <string>
 
+#include "index/AccumulatedSizes.h"
 #include "index/CrawlBatch.h"
 #include "index/CrawlRules.h"
 #include "index/CrawlVolume.h"
@@ -22,7 +23,7 @@ namespace norvex {
 struct CrawlFigures {
   std::uint64_t files = 0;    // everything that is no folder, under each of its names
   std::uint64_t folders = 0;  // without the volume's root
-  StoreAccumulatedSizes accumulatedSizes{};
+  AccumulatedSizes accumulatedSizes;
   CrawlProblems problems;
 };
 

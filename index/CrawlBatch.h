@@ -8,6 +8,9 @@
 #include <string_view>
 #include <vector>
 
+#include "index/ContentTypes.h"
+#include "index/StoragePosition.h"
+
 namespace norvex {
 
 enum class CrawlItemKind : std::uint8_t { file, otherNoFolder, folder, border };
@@ -15,9 +18,9 @@ enum class CrawlItemKind : std::uint8_t { file, otherNoFolder, folder, border };
 struct CrawledItem {
   std::uint32_t nameStart = 0;  // in CrawlBatch::names
   std::uint16_t nameLength = 0;
-  CrawlItemKind kind = CrawlItemKind::file;  // border: a folder that is not entered
-  std::uint8_t sizePosition = 0;             // of regular files
-  std::uint32_t type = 0;
+  CrawlItemKind kind = CrawlItemKind::file;           // border: a folder that is not entered
+  StoragePosition position = StoragePosition::other;  // of regular files
+  TypeId type = 0;
   std::int64_t size = 0;   // bytes; of folders meaningless
   std::int64_t mtime = 0;  // nanoseconds since 1970
 };

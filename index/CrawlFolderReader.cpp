@@ -3,11 +3,9 @@
 #include <dirent.h>
 #include <fcntl.h>
 #include <linux/btrfs.h>
-#include <linux/magic.h>
 #include <sched.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
-#include <sys/statfs.h>
 #include <sys/syscall.h>
 #include <sys/xattr.h>
 #include <unistd.h>
@@ -18,6 +16,8 @@
 #include <cstring>
 #include <limits>
 
+#include "index/FolderRules.h"
+#include "index/SparseAttributes.h"
 #include "platform/PackageNames.h"
 
 namespace norvex {
@@ -27,17 +27,13 @@ constexpr std::size_t kEntriesBytes = 64 * 1024;
 constexpr std::size_t kLongestAttribute = 64 * 1024;  // the kernel's limit of a list of names and of a value
 constexpr unsigned kWanted = STATX_TYPE | STATX_MODE | STATX_INO | STATX_SIZE | STATX_MTIME | STATX_MNT_ID;
 
-constexpr std::string_view kUserPrefix = "user.";
-constexpr std::string_view kCarriedPrefixes[] = {"user.kMDItem", "user.com_brixo_"};
-constexpr std::string_view kBuiltIn[] = {
-    "kMDItemPath",        "kMDItemFSName",          "kMDItemFSSize", "kMDItemFSContentChangeDate",
-    "kMDItemContentType", "kMDItemContentTypeTree", "kMDItemKind"};
-constexpr std::string_view kNoBackup = "user.xdg.robots.backup";
-constexpr std::string_view kCacheTagName = "CACHEDIR.TAG";
-constexpr std::string_view kCacheTagSignature = "Signature: 8a477f597d28d172789f06886806bc55";
-constexpr std::string_view kReceiptPath = "Contents/_DovecartReceipt/receipt";
-constexpr CrawlMark kExcluded{"com_brixo_backup_excludeItem", "com.brixo.backupd"};
-constexpr CrawlMark kHasReceipt{"kMDItemDovecartHasReceipt", "1"};
+// What a rule gives to an item.
+struct Mark {
+  std::string_view name;
+  std::string_view value;
+};
+constexpr Mark kExcluded{"com_brixo_backup_excludeItem", "com.brixo.backupd"};
+constexpr Mark kHasReceipt{"kMDItemDovecartHasReceipt", "1"};
 
 constexpr std::uint64_t kSubvolumeRootInode = 256;
 
@@ -66,10 +62,9 @@ std::int64_t bounded(std::uint64_t size) {
 }
 
 // One that was taken of another subvolume and cannot change: what is in it is counted where it was taken of.
-bool isReadOnlySnapshot(int fd, const struct statx& status) {
-  if (status.stx_ino != kSubvolumeRootInode) return false;
-  struct statfs info {};
-  if (::fstatfs(fd, &info) != 0 || info.f_type != BTRFS_SUPER_MAGIC) return false;
+bool isReadOnlySnapshot(int fd) {
+  struct stat status {};
+  if (::fstat(fd, &status) != 0 || status.st_ino != kSubvolumeRootInode) return false;
   btrfs_ioctl_get_subvol_info_args subvolume{};
   if (::ioctl(fd, BTRFS_IOC_GET_SUBVOL_INFO, &subvolume) != 0) return false;
   const bool isSnapshot = std::any_of(std::begin(subvolume.parent_uuid), std::end(subvolume.parent_uuid),
@@ -77,15 +72,7 @@ bool isReadOnlySnapshot(int fd, const struct statx& status) {
   return isSnapshot && (subvolume.flags & BTRFS_SUBVOL_RDONLY) != 0;
 }
 
-bool isCarried(std::string_view attribute) {
-  const bool hasPrefix = std::any_of(std::begin(kCarriedPrefixes), std::end(kCarriedPrefixes),
-                                     [&](std::string_view prefix) { return attribute.starts_with(prefix); });
-  if (!hasPrefix) return false;
-  attribute.remove_prefix(kUserPrefix.size());
-  return std::find(std::begin(kBuiltIn), std::end(kBuiltIn), attribute) == std::end(kBuiltIn);
-}
-
-void addMark(CrawlBatch& batch, std::uint32_t item, const CrawlMark& mark) {
+void addMark(CrawlBatch& batch, std::uint32_t item, const Mark& mark) {
   batch.attributes.push_back({item, std::string(mark.name), std::string(mark.value)});
 }
 
@@ -111,12 +98,8 @@ CrawlFolderReader::CrawlFolderReader(const CrawlVolume& volume, const CrawlRules
 Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const CrawlPlace& place) {
   auto fd = volume_.openFolder(path);
   if (!fd) return fd.error();
-  struct statx status {};
-  if (::statx(fd.value().get(), "", AT_EMPTY_PATH | volume_.statFlags(), kWanted, &status) != 0) {
-    return systemError(errno);
-  }
-  if (!volume_.holds(status)) return systemError(EXDEV);
-  if (!path.empty() && isReadOnlySnapshot(fd.value().get(), status)) return systemError(EXDEV);
+  if (volume_.mayHaveSnapshots() && !path.empty() && isReadOnlySnapshot(fd.value().get()))
+    return systemError(EXDEV);
   return CrawlFolder{path, volume_.absolute(path), place, std::move(fd).value()};
 }
 
@@ -184,18 +167,16 @@ void CrawlFolderReader::readItem(const CrawlFolder& folder, std::string_view nam
   if ((isFile || isFolder) && isHeld) own = readAttributes(folder, text, isFolder, number, batch);
   if (isFolder) {
     item.kind = isHeld ? CrawlItemKind::folder : CrawlItemKind::border;
-    item.type = rules_.folderType(name, own.isMarkedPackage);
+    item.type = rules_.types().ofFolder(name, own.isMarkedPackage);
+    if (rules_.folderHasReceipt(folder.absolute + "/" + text)) addMark(batch, number, kHasReceipt);
   } else if (isFile) {
     const bool isExecutable = (status.stx_mode & (S_IXUSR | S_IXGRP | S_IXOTH)) != 0;
-    item.type = rules_.fileType(name);
-    item.sizePosition =
-        static_cast<std::uint8_t>(rules_.sizePosition(item.type, name, isExecutable, folder.place));
+    item.type = rules_.types().ofFile(name);
+    item.position = rules_.sizePosition(item.type, isExecutable, folder.place);
+    if (rules_.fileHasReceipt(folder.absolute, name)) addMark(batch, number, kHasReceipt);
   } else {
     item.kind = CrawlItemKind::otherNoFolder;
-    item.type = S_ISLNK(status.stx_mode) ? rules_.symbolicLinkType() : rules_.otherType();
-  }
-  if ((isFile || isFolder) && rules_.hasReceiptByPlace(folder.absolute, name, isFolder)) {
-    addMark(batch, number, kHasReceipt);
+    item.type = S_ISLNK(status.stx_mode) ? rules_.types().symbolicLink() : rules_.types().other();
   }
   item.nameStart = static_cast<std::uint32_t>(batch.names.size());
   item.nameLength = static_cast<std::uint16_t>(name.size());
@@ -217,14 +198,14 @@ CrawlFolderReader::OwnAttributes CrawlFolderReader::readAttributes(const CrawlFo
     const char* attribute = attributeNames_.data() + offset;
     const std::string_view text(attribute);
     offset += static_cast<ssize_t>(text.size()) + 1;
-    if (!text.starts_with(kUserPrefix)) continue;
-    if (isCarried(text)) {
+    if (const auto carried = sparseAttributeName(text)) {
       const std::string_view value = readValue(folder, name, attribute, batch);
-      if (value.data() == nullptr) continue;
-      batch.attributes.push_back({item, std::string(text.substr(kUserPrefix.size())), std::string(value)});
+      if (value.data() != nullptr)
+        batch.attributes.push_back({item, std::string(*carried), std::string(value)});
     } else if (isFolder && text == kPackageMarkAttribute) {
-      own.isMarkedPackage = readValue(folder, name, attribute, batch) == kPackageMarkValue;
-    } else if (isFolder && text == kNoBackup && readValue(folder, name, attribute, batch) == "false") {
+      own.isMarkedPackage = withoutTerminator(readValue(folder, name, attribute, batch)) == kPackageMarkValue;
+    } else if (isFolder && text == kRobotsBackupAttribute &&
+               refusesBackup(readValue(folder, name, attribute, batch))) {
       addMark(batch, item, kExcluded);
     }
   }
@@ -241,41 +222,31 @@ std::string_view CrawlFolderReader::readValue(const CrawlFolder& folder, const c
   return {};
 }
 
-void CrawlFolderReader::readFolderItself(const CrawlFolder& folder, const CrawlNames& names,
-                                         std::uint32_t type, CrawlBatch& batch) {
-  const bool isRoot = folder.path.empty();
-  if (!isRoot && names.contains(kCacheTagName) && carriesCacheTag(folder)) {
+void CrawlFolderReader::readFolderItself(const CrawlFolder& folder, const CrawlNames& names, TypeId type,
+                                         CrawlBatch& batch) {
+  if (names.contains(kCacheTagName) && carriesCacheTag(folder)) {
     addMark(batch, CrawledAttribute::kFolderItself, kExcluded);
   }
-  const std::string_view name = std::string_view(folder.absolute).substr(folder.absolute.rfind('/') + 1);
-  if (!rules_.mayHoldReceipt(name, type)) return;
-  struct stat status {};
-  if (::fstatat(folder.fd.get(), kReceiptPath.data(), &status, AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT) == 0) {
+  if (rules_.isPackage(type) && volume_.holdsFile(folder.fd.get(), kReceiptPathInPackage)) {
     addMark(batch, CrawledAttribute::kFolderItself, kHasReceipt);
   }
 }
 
 bool CrawlFolderReader::carriesCacheTag(const CrawlFolder& folder) const {
+  CacheTag tag;
+  tag.isInVolumeRoot = folder.path.empty();
   struct stat status {};
   if (::fstatat(folder.fd.get(), kCacheTagName.data(), &status, AT_SYMLINK_NOFOLLOW) != 0) return false;
   if (!S_ISREG(status.st_mode)) return false;
   // Should a device or a pipe take its place now, opening it must neither wait nor do anything.
   const ScopedFd file(::openat(folder.fd.get(), kCacheTagName.data(),
                                O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
-  std::array<char, kCacheTagSignature.size()> start{};
-  return file && ::fstat(file.get(), &status) == 0 && S_ISREG(status.st_mode) &&
-         ::pread(file.get(), start.data(), start.size(), 0) == static_cast<ssize_t>(start.size()) &&
-         std::string_view(start.data(), start.size()) == kCacheTagSignature;
-}
-
-bool CrawlFolderReader::isMailFolder(const CrawlFolder& folder, const CrawlNames& names) const {
-  for (const char* name : {"cur", "new", "tmp"}) {
-    struct stat status {};
-    if (!names.contains(name)) return false;
-    if (::fstatat(folder.fd.get(), name, &status, AT_SYMLINK_NOFOLLOW) != 0 || !S_ISDIR(status.st_mode))
-      return false;
-  }
-  return true;
+  tag.isRegularFile = file && ::fstat(file.get(), &status) == 0 && S_ISREG(status.st_mode);
+  if (!tag.isRegularFile) return false;
+  std::array<char, kCacheTagSignatureSize> start{};
+  const ssize_t size = ::pread(file.get(), start.data(), start.size(), 0);
+  tag.firstBytes = {start.data(), static_cast<std::size_t>(std::max<ssize_t>(size, 0))};
+  return isValidCacheTag(tag);
 }
 
 CrawledItem CrawlFolderReader::readRoot(CrawlFolder& root, CrawlBatch& batch) {
@@ -286,7 +257,8 @@ CrawledItem CrawlFolderReader::readRoot(CrawlFolder& root, CrawlBatch& batch) {
   if (::statx(root.fd.get(), "", AT_EMPTY_PATH, kWanted, &status) == 0)
     item.mtime = nanoseconds(status.stx_mtime);
   const OwnAttributes own = readAttributes(root, ".", true, CrawledAttribute::kFolderItself, batch);
-  item.type = rules_.folderType(root.absolute.substr(root.absolute.rfind('/') + 1), own.isMarkedPackage);
+  item.type =
+      rules_.types().ofFolder(root.absolute.substr(root.absolute.rfind('/') + 1), own.isMarkedPackage);
   return item;
 }
 

@@ -60,11 +60,7 @@ class CrawlFolderReader {
                  CrawlBatch& batch);
 
   // Adds what the folder is given for what is in it. `type`: the folder's own.
-  void readFolderItself(const CrawlFolder& folder, const CrawlNames& names, std::uint32_t type,
-                        CrawlBatch& batch);
-
-  // Whether the folder has the three folders of a mail folder.
-  bool isMailFolder(const CrawlFolder& folder, const CrawlNames& names) const;
+  void readFolderItself(const CrawlFolder& folder, const CrawlNames& names, TypeId type, CrawlBatch& batch);
 
   // The root has no folder around it in which it could be read.
   CrawledItem readRoot(CrawlFolder& root, CrawlBatch& batch);

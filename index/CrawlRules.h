@@ -1,56 +1,50 @@
-// What the crawl has to know about items besides what the file system says: their types, the attributes that
-// it derives, and where their bytes are accumulated.
+// What the crawl has to know about items besides what the file system says: their types, what they inherit
+// from the folder that they are in, and which of them have a receipt.
 //
-// Asked by several threads at once; const. Paths are absolute, names are the file system's bytes.
+// Made once for an update, then constant and asked by several threads at once. Paths are absolute; names and
+// paths are the file system's bytes.
 #pragma once
 
-#include <cstddef>
-#include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
 
-#include "index/StoreWriter.h"
+#include "index/ContentTypes.h"
+#include "index/StoragePosition.h"
 
 namespace norvex {
 
 // What items inherit from the folder that they are in.
 struct CrawlPlace {
-  bool inApplication = false;  // inside an application bundle or deployment, at any depth
-  bool holdsMessages = false;  // the `cur` or `new` of a mail folder
-};
-
-// What a rule says about one item besides its type.
-struct CrawlMark {
-  std::string_view name;
-  std::string_view value;
+  bool inApplication = false;  // inside an application, at any depth
+  bool holdsMessages = false;  // a folder of messages of a Maildir
 };
 
 class CrawlRules {
  public:
-  virtual ~CrawlRules() = default;
+  // `dataHome`: the user's data folder, where Flatpak may have an installation.
+  CrawlRules(ContentTypes types, std::string_view dataHome);
 
-  // Type numbers are small and count from 0.
-  virtual std::uint32_t fileType(std::string_view name) const = 0;
-  virtual std::uint32_t folderType(std::string_view name, bool isMarkedPackage) const = 0;
-  virtual std::uint32_t symbolicLinkType() const = 0;
-  virtual std::uint32_t otherType() const = 0;
-  virtual StoreType describe(std::uint32_t type) const = 0;
+  const ContentTypes& types() const { return types_; }
 
-  // The position, below kAccumulatedSizeCount, that a regular file's size counts in.
-  virtual std::size_t sizePosition(std::uint32_t type, std::string_view name, bool isExecutable,
-                                   const CrawlPlace& place) const = 0;
+  // Whether it is the type of a folder that people see as one file.
+  bool isPackage(TypeId folderType) const { return folderType != plainFolder_; }
 
-  // What a folder passes on to its items. `inMailFolder`: it is in a folder that has `cur`, `new` and `tmp`.
-  virtual CrawlPlace placeInside(std::string_view path, std::string_view name, const CrawlPlace& around,
-                                 bool inMailFolder) const = 0;
+  // Where a regular file's size is counted.
+  StoragePosition sizePosition(TypeId type, bool isExecutable, const CrawlPlace& place) const;
 
-  // Whether the folder is one in which a receipt is looked for.
-  virtual bool mayHoldReceipt(std::string_view name, std::uint32_t type) const = 0;
+  // What a folder passes on to its items. `inMaildir`: it is a direct child of a Maildir.
+  CrawlPlace placeInside(std::string_view path, std::string_view name, const CrawlPlace& around,
+                         bool inMaildir) const;
 
-  // Whether an item has a receipt because of where it is: an application's deployment, an application
-  // archive.
-  virtual bool hasReceiptByPlace(std::string_view folderPath, std::string_view name, bool isFolder) const = 0;
+  // Whether an item has a receipt because of where it is.
+  bool fileHasReceipt(std::string_view folderPath, std::string_view name) const;
+  bool folderHasReceipt(std::string_view path) const;
+
+ private:
+  ContentTypes types_;
+  std::vector<std::string> flatpakInstallations_;
+  TypeId plainFolder_;
 };
 
 }  // namespace norvex

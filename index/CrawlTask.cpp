@@ -17,14 +17,12 @@ void CrawlFolderTask::run(CrawlFolderReader& reader) {
     return;
   }
   if (!listed) error = listed.error();
-  isMailFolder = reader.isMailFolder(folder.value(), names);
   reader.readItems(folder.value(), names, 0, names.size(), batch);
   reader.readFolderItself(folder.value(), names, type, batch);
 }
 
 void CrawlNamesTask::run(CrawlFolderReader& reader) {
-  const bool isFirst = opened == nullptr;
-  if (isFirst) {
+  if (opened == nullptr) {
     auto folder = reader.enter(folder_.path, folder_.place);
     if (!folder) {
       error = folder.error();
@@ -36,7 +34,6 @@ void CrawlNamesTask::run(CrawlFolderReader& reader) {
   const Result<bool> listed = reader.list(opened->folder, opened->names, kMostNameBytes);
   if (!listed) error = listed.error();
   isAtEnd = !listed || listed.value();
-  isMailFolder = isFirst && reader.isMailFolder(opened->folder, opened->names);
   reader.readFolderItself(opened->folder, opened->names, folder_.type, batch);
 }
 

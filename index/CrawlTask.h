@@ -4,6 +4,7 @@
 // A task is filled in by the writer, run by one worker, and read by the writer once it is done.
 #pragma once
 
+#include <atomic>
 #include <cstddef>
 #include <memory>
 #include <optional>
@@ -25,7 +26,7 @@ class CrawlTask {
 
  private:
   friend class CrawlWorkers;
-  bool isDone_ = false;  // guarded by the workers' lock
+  std::atomic<bool> isDone_{false};
 };
 
 // A folder that a later task reads on.
@@ -40,14 +41,13 @@ class CrawlFolderTask final : public CrawlTask {
  public:
   static constexpr std::size_t kMostNameBytes = 32 * 1024;
 
-  CrawlFolderTask(std::string folderPath, const CrawlPlace& folderPlace, std::uint32_t folderType)
+  CrawlFolderTask(std::string folderPath, const CrawlPlace& folderPlace, TypeId folderType)
       : path(std::move(folderPath)), place(folderPlace), type(folderType) {}
   void run(CrawlFolderReader& reader) override;
 
   const std::string path;
   const CrawlPlace place;
-  const std::uint32_t type;
-  bool isMailFolder = false;
+  const TypeId type;
   bool isLarge = false;
 };
 
@@ -62,7 +62,6 @@ class CrawlNamesTask final : public CrawlTask {
 
   std::shared_ptr<CrawlOpenFolder> opened;
   bool isAtEnd = false;
-  bool isMailFolder = false;
 
  private:
   const CrawlFolderTask& folder_;

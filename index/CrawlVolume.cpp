@@ -1,6 +1,7 @@
 #include "index/CrawlVolume.h"
 
 #include <fcntl.h>
+#include <linux/magic.h>
 #include <linux/openat2.h>
 #include <sys/stat.h>
 #include <sys/statfs.h>
@@ -17,6 +18,7 @@
 namespace norvex {
 namespace {
 
+constexpr std::size_t kLongestPart = PATH_MAX - 1;
 constexpr unsigned kWanted = STATX_TYPE | STATX_INO | STATX_MNT_ID;
 
 // File systems whose attributes are elsewhere and may have changed there: these are asked anew.
@@ -30,30 +32,20 @@ constexpr std::array<std::uint32_t, 7> kRemoteFileSystems{
     0x5346414F,  // AFS
 };
 
-bool isRemote(int fd) {
-  struct statfs info {};
-  if (::fstatfs(fd, &info) != 0) return true;
-  const auto type = static_cast<std::uint32_t>(info.f_type);
-  return std::find(kRemoteFileSystems.begin(), kRemoteFileSystems.end(), type) != kRemoteFileSystems.end();
+bool isRemote(std::uint32_t fileSystemType) {
+  return std::find(kRemoteFileSystems.begin(), kRemoteFileSystems.end(), fileSystemType) !=
+         kRemoteFileSystems.end();
 }
 
 std::uint64_t deviceOf(const struct statx& status) {
   return (std::uint64_t{status.stx_dev_major} << 32) | status.stx_dev_minor;
 }
 
-// One step below `folder`, of at most PATH_MAX bytes.
-int openBelow(int folder, const char* path, int flags) {
+int openat2Below(int folder, const char* path, int flags) {
   open_how how{};
-  how.flags = static_cast<std::uint64_t>(static_cast<unsigned>(flags | O_DIRECTORY | O_CLOEXEC | O_NOFOLLOW));
+  how.flags = static_cast<std::uint64_t>(static_cast<unsigned>(flags | O_CLOEXEC | O_NOFOLLOW));
   how.resolve = RESOLVE_NO_SYMLINKS | RESOLVE_NO_XDEV;
   return static_cast<int>(::syscall(SYS_openat2, folder, path, &how, sizeof how));
-}
-
-// The folder's own access time stays as it was where that is allowed: to its owner.
-int openToRead(int folder, const char* path) {
-  const int fd = openBelow(folder, path, O_RDONLY | O_NOATIME);
-  if (fd >= 0 || errno != EPERM) return fd;
-  return openBelow(folder, path, O_RDONLY);
 }
 
 }  // namespace
@@ -78,6 +70,8 @@ CrawlVolume::CrawlVolume(CrawlVolume&& other) noexcept
       leftOutDevice_(other.leftOutDevice_),
       leftOutInode_(other.leftOutInode_),
       statFlags_(other.statFlags_),
+      mayHaveSnapshots_(other.mayHaveSnapshots_),
+      hasOpenat2_(other.hasOpenat2_),
       hasAttributes_(other.hasAttributes()) {}
 
 Result<CrawlVolume> CrawlVolume::open(const std::string& root, const std::string& leftOutFolder) {
@@ -89,8 +83,14 @@ Result<CrawlVolume> CrawlVolume::open(const std::string& root, const std::string
   if (::statx(volume.fd_.get(), "", AT_EMPTY_PATH, kWanted, &status) != 0) return systemError(errno);
   volume.mount_ = status.stx_mnt_id;
   volume.device_ = deviceOf(status);
-  volume.statFlags_ = AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT |
-                      (isRemote(volume.fd_.get()) ? AT_STATX_SYNC_AS_STAT : AT_STATX_DONT_SYNC);
+  struct statfs info {};
+  if (::fstatfs(volume.fd_.get(), &info) != 0) return systemError(errno);
+  const auto type = static_cast<std::uint32_t>(info.f_type);
+  volume.statFlags_ =
+      AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT | (isRemote(type) ? AT_STATX_SYNC_AS_STAT : AT_STATX_DONT_SYNC);
+  volume.mayHaveSnapshots_ = type == BTRFS_SUPER_MAGIC;
+  // Old kernels have no openat2(), and some sandboxes refuse it.
+  volume.hasOpenat2_ = ScopedFd(openat2Below(volume.fd_.get(), ".", O_PATH)).get() >= 0;
   if (::statx(AT_FDCWD, leftOutFolder.c_str(), 0, kWanted, &status) == 0) {
     volume.leftOutDevice_ = deviceOf(status);
     volume.leftOutInode_ = status.stx_ino;
@@ -105,21 +105,44 @@ std::string CrawlVolume::absolute(std::string_view path) const {
   return whole.append(path);
 }
 
-Result<ScopedFd> CrawlVolume::openFolder(const std::string& path) const {
+// Opens `path` below `folder`, in as many steps as its length or the kernel asks for.
+Result<ScopedFd> CrawlVolume::openBelow(int folder, std::string_view path, int flags) const {
+  const std::size_t longest = hasOpenat2_ ? kLongestPart : 0;
   ScopedFd passed;
-  int from = fd_.get();
-  std::size_t start = 0;
-  while (path.size() - start >= PATH_MAX) {
-    const std::size_t end = path.rfind('/', start + PATH_MAX - 1);
-    passed = ScopedFd(openBelow(from, path.substr(start, end - start).c_str(), O_PATH));
-    if (!passed) return systemError(errno);
-    from = passed.get();
-    start = end + 1;
+  while (path.size() > longest && path.find('/') != std::string_view::npos) {
+    const std::size_t end = std::min(path.rfind('/', longest), path.find('/', longest));
+    auto part =
+        openPart(passed ? passed.get() : folder, std::string(path.substr(0, end)), O_PATH | O_DIRECTORY);
+    if (!part) return part;
+    passed = std::move(part).value();
+    path.remove_prefix(end + 1);
   }
-  const char* rest = path.c_str() + start;
-  ScopedFd fd(openToRead(from, *rest == '\0' ? "." : rest));
+  return openPart(passed ? passed.get() : folder, std::string(path), flags);
+}
+
+Result<ScopedFd> CrawlVolume::openPart(int folder, const std::string& path, int flags) const {
+  ScopedFd fd(hasOpenat2_ ? openat2Below(folder, path.c_str(), flags)
+                          : ::openat(folder, path.c_str(), flags | O_CLOEXEC | O_NOFOLLOW));
   if (!fd) return systemError(errno);
+  if (hasOpenat2_) return fd;
+  struct statx status {};
+  if (::statx(fd.get(), "", AT_EMPTY_PATH | statFlags_, kWanted, &status) != 0) return systemError(errno);
+  if (!holds(status)) return systemError(EXDEV);
   return fd;
+}
+
+Result<ScopedFd> CrawlVolume::openFolder(const std::string& path) const {
+  const std::string_view place = path.empty() ? std::string_view(".") : std::string_view(path);
+  // The folder's access time stays as it was where that is allowed: to its owner.
+  auto fd = openBelow(fd_.get(), place, O_RDONLY | O_DIRECTORY | O_NOATIME);
+  if (fd || fd.error().code != EPERM) return fd;
+  return openBelow(fd_.get(), place, O_RDONLY | O_DIRECTORY);
+}
+
+bool CrawlVolume::holdsFile(int folder, std::string_view path) const {
+  const auto file = openBelow(folder, path, O_PATH);
+  struct stat status {};
+  return file && ::fstat(file.value().get(), &status) == 0 && S_ISREG(status.st_mode);
 }
 
 bool CrawlVolume::holds(const struct statx& status) const {

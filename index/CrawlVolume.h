@@ -35,6 +35,9 @@ class CrawlVolume {
   // link or another volume. Any length. errno on failure: EXDEV for another volume.
   Result<ScopedFd> openFolder(const std::string& path) const;
 
+  // Whether there is a regular file at `path` below an open folder, no part of which is a link.
+  bool holdsFile(int folder, std::string_view path) const;
+
   // Whether what statx() says is an item of this volume, and not the root of what is mounted over one.
   bool holds(const struct statx& status) const;
 
@@ -44,11 +47,17 @@ class CrawlVolume {
   // volume.
   int statFlags() const { return statFlags_; }
 
+  // Whether it is of the kind of file system that has snapshots among its folders.
+  bool mayHaveSnapshots() const { return mayHaveSnapshots_; }
+
   bool hasAttributes() const { return hasAttributes_.load(std::memory_order_relaxed); }
   void noteNoAttributes() const { hasAttributes_.store(false, std::memory_order_relaxed); }
 
  private:
   CrawlVolume() = default;
+
+  Result<ScopedFd> openBelow(int folder, std::string_view path, int flags) const;
+  Result<ScopedFd> openPart(int folder, const std::string& path, int flags) const;
 
   std::string root_;
   ScopedFd fd_;
@@ -56,6 +65,8 @@ class CrawlVolume {
   std::uint64_t device_ = 0;
   std::uint64_t leftOutDevice_ = 0, leftOutInode_ = 0;
   int statFlags_ = 0;
+  bool mayHaveSnapshots_ = false;
+  bool hasOpenat2_ = true;
   mutable std::atomic<bool> hasAttributes_{true};
 };
 

@@ -29,51 +29,57 @@ CrawlWorkers::~CrawlWorkers() {
 
 void CrawlWorkers::give(std::vector<std::shared_ptr<CrawlTask>> tasks) {
   if (tasks.empty()) return;
+  bool isAwaited = false;
   {
     const std::lock_guard lock(mutex_);
     waiting_.insert(waiting_.end(), std::make_move_iterator(tasks.rbegin()),
                     std::make_move_iterator(tasks.rend()));
+    waitingCount_.store(waiting_.size(), std::memory_order_relaxed);
+    isAwaited = idle_ > 0;
   }
-  given_.notify_all();
+  if (isAwaited) given_.notify_all();
 }
 
 bool CrawlWorkers::finish(const CrawlTask& task, const std::atomic<bool>& cancelled) {
-  std::unique_lock lock(mutex_);
-  wanted_ = &task;
-  while (!task.isDone_ && !cancelled.load(std::memory_order_relaxed)) {
-    if (waiting_.empty()) {
-      done_.wait_for(lock, kLookForCancel);
-    } else {
-      runNext(reader_, lock);
+  const auto isDone = [&task] { return task.isDone_.load(); };
+  if (!isDone()) {
+    wanted_.store(&task);
+    std::unique_lock lock(mutex_);
+    while (!isDone() && !cancelled.load(std::memory_order_relaxed)) {
+      if (waiting_.empty()) {
+        done_.wait_for(lock, kLookForCancel);
+      } else {
+        runNext(reader_, lock);
+      }
     }
+    wanted_.store(nullptr);
   }
-  wanted_ = nullptr;
-  if (task.isDone_) heldBytes_ -= task.batch.bytes();
-  return task.isDone_;
+  if (isDone()) heldBytes_.fetch_sub(task.batch.bytes(), std::memory_order_relaxed);
+  return isDone() && !cancelled.load(std::memory_order_relaxed);
 }
 
-CrawlWorkers::Load CrawlWorkers::load() const {
-  const std::lock_guard lock(mutex_);
-  return {waiting_.size(), heldBytes_};
-}
-
+// The lock is taken once a task: what it leaves behind is told by atomics, of which `isDone_` publishes the
+// task.
 void CrawlWorkers::runNext(CrawlFolderReader& reader, std::unique_lock<std::mutex>& lock) {
   const std::shared_ptr<CrawlTask> task = std::move(waiting_.back());
   waiting_.pop_back();
+  waitingCount_.store(waiting_.size(), std::memory_order_relaxed);
   lock.unlock();
   task->run(reader);
-  const std::size_t bytes = task->batch.bytes();
+  heldBytes_.fetch_add(task->batch.bytes(), std::memory_order_relaxed);
+  task->isDone_.store(true);
+  const bool isWanted = wanted_.load() == task.get();
   lock.lock();
-  heldBytes_ += bytes;
-  task->isDone_ = true;
-  if (wanted_ == task.get()) done_.notify_one();
+  if (isWanted) done_.notify_one();
 }
 
 void CrawlWorkers::work() {
   CrawlFolderReader reader(volume_, rules_);
   std::unique_lock lock(mutex_);
   while (true) {
+    ++idle_;
     given_.wait(lock, [this] { return isClosing_ || !waiting_.empty(); });
+    --idle_;
     if (isClosing_) return;
     runNext(reader, lock);
   }

@@ -33,12 +33,9 @@ class CrawlWorkers {
   // this thread runs what waits. False when `cancelled` came first.
   bool finish(const CrawlTask& task, const std::atomic<bool>& cancelled);
 
-  // Tasks that nobody has begun, and about the memory of those that are done and not finished, in bytes.
-  struct Load {
-    std::size_t waiting = 0;
-    std::size_t heldBytes = 0;
-  };
-  Load load() const;
+  // How many tasks nobody has begun; and about the memory of those that are done and not finished, in bytes.
+  std::size_t waiting() const { return waitingCount_.load(std::memory_order_relaxed); }
+  std::size_t heldBytes() const { return heldBytes_.load(std::memory_order_relaxed); }
 
  private:
   void work();
@@ -47,12 +44,14 @@ class CrawlWorkers {
   const CrawlVolume& volume_;
   const CrawlRules& rules_;
   CrawlFolderReader reader_;  // the writer's own
-  mutable std::mutex mutex_;
+  std::mutex mutex_;
   std::condition_variable given_, done_;
   std::vector<std::shared_ptr<CrawlTask>> waiting_;
-  const CrawlTask* wanted_ = nullptr;
-  std::size_t heldBytes_ = 0;
+  std::size_t idle_ = 0;  // helpers that wait for tasks
   bool isClosing_ = false;
+  std::atomic<std::size_t> waitingCount_{0};
+  std::atomic<std::size_t> heldBytes_{0};
+  std::atomic<const CrawlTask*> wanted_{nullptr};
   std::vector<std::thread> threads_;
 };
 

@@ -60,9 +60,9 @@ class IndexUpdate {
   Result<void> publishEmpty() {
     auto store = StoreWriter::create(folder_.unfinishedPath(root_), cancelled_);
     if (!store) return store.error();
-    const std::uint32_t type = rules_.folderType(root_.substr(root_.rfind('/') + 1), false);
+    const TypeId type = rules_.types().ofFolder(root_.substr(root_.rfind('/') + 1), false);
     store.value().add({0, {}, type, std::nullopt, 0});
-    store.value().addType(type, rules_.describe(type));
+    store.value().addType(type, rules_.types().type(type));
     if (const auto finished = store.value().finishEmpty(facts_); !finished) return finished;
     return folder_.publish(root_);
   }
@@ -76,7 +76,7 @@ class IndexUpdate {
     facts_.files = figures.value().files;
     facts_.folders = figures.value().folders;
     facts_.unreadable = figures.value().problems.count;
-    facts_.accumulatedSizes = figures.value().accumulatedSizes;
+    facts_.accumulatedSizes = figures.value().accumulatedSizes.values();
     if (const auto finished = store.value().finish(facts_, secondsSince1970()); !finished)
       return finished.error();
     if (cancelled_.load(std::memory_order_relaxed)) return systemError(ECANCELED);

@@ -237,7 +237,7 @@ std::optional<StoreCounts> StoreReader::counts() const {
   return healthCheck_ ? std::optional(counts_) : std::nullopt;
 }
 
-std::optional<StoreAccumulatedSizes> StoreReader::accumulatedSizes() const {
+std::optional<AccumulatedSizes::Values> StoreReader::accumulatedSizes() const {
   return healthCheck_ ? std::optional(accumulatedSizes_) : std::nullopt;
 }
 

@@ -14,6 +14,7 @@
 #include <string_view>
 #include <vector>
 
+#include "index/AccumulatedSizes.h"
 #include "index/StoreDatabase.h"
 #include "index/StoreFolder.h"
 #include "index/StoreSchema.h"
@@ -65,7 +66,7 @@ class StoreReader {
   // way. The counts and sizes are then none either.
   std::optional<std::int64_t> healthCheck() const { return healthCheck_; }
   std::optional<StoreCounts> counts() const;
-  std::optional<StoreAccumulatedSizes> accumulatedSizes() const;
+  std::optional<AccumulatedSizes::Values> accumulatedSizes() const;
 
   // The item of a path below the volume's root, which is empty itself; no item is no failure.
   Result<std::optional<std::int64_t>> itemAt(std::string_view path);
@@ -114,7 +115,7 @@ class StoreReader {
   std::string root_, fileSystem_;
   std::optional<std::int64_t> healthCheck_;
   StoreCounts counts_;
-  StoreAccumulatedSizes accumulatedSizes_{};
+  AccumulatedSizes::Values accumulatedSizes_{};
   bool isOlder_ = false;
   std::int64_t workLeft_ = 0, mostWork_ = 0;  // thousands of SQLite's instructions
   StoreStatement itemById_, folderById_, childByName_, carriedByName_;

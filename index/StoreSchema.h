@@ -64,7 +64,4 @@ inline constexpr std::string_view kFactUnreadable = "unreadable";   // items tha
 inline constexpr std::string_view kFactAccumulatedSizes = "accumulated_sizes";  // numbers with blanks between
 inline constexpr std::string_view kFactHealthCheck = "health_check";            // seconds since 1970
 
-inline constexpr std::size_t kAccumulatedSizeCount = 18;
-using StoreAccumulatedSizes = std::array<std::int64_t, kAccumulatedSizeCount>;
-
 }  // namespace norvex

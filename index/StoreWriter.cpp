@@ -6,10 +6,12 @@
 
 #include <cerrno>
 #include <utility>
+#include <variant>
 
 #include "index/ScopedFd.h"
+#include "index/SparseAttributes.h"
 #include "index/StoreSeal.h"
-#include "index/StoreValue.h"
+#include "platform/Utf8.h"
 
 namespace norvex {
 namespace {
@@ -28,7 +30,23 @@ void bindText(sqlite3_stmt* statement, int index, std::string_view text) {
   sqlite3_bind_text(statement, index, text.data(), static_cast<int>(text.size()), SQLITE_STATIC);
 }
 
-std::string joined(const StoreAccumulatedSizes& sizes) {
+// What is not UTF-8 is kept as bytes.
+void bindValue(sqlite3_stmt* statement, int index, const MetadataValue& value) {
+  if (const auto* whole = std::get_if<std::int64_t>(&value)) {
+    sqlite3_bind_int64(statement, index, *whole);
+  } else if (const auto* real = std::get_if<double>(&value)) {
+    sqlite3_bind_double(statement, index, *real);
+  } else if (const auto* text = std::get_if<std::string>(&value)) {
+    const int length = static_cast<int>(text->size());
+    if (isValidUtf8(*text) && text->find('\0') == std::string::npos) {
+      sqlite3_bind_text(statement, index, text->data(), length, SQLITE_STATIC);
+    } else {
+      sqlite3_bind_blob(statement, index, text->data(), length, SQLITE_STATIC);
+    }
+  }
+}
+
+std::string joined(const AccumulatedSizes::Values& sizes) {
   std::string text;
   for (const std::int64_t size : sizes) text += (text.empty() ? "" : " ") + std::to_string(size);
   return text;
@@ -73,7 +91,7 @@ Result<void> StoreWriter::begin() {
   const std::pair<StoreStatement*, const char*> statements[] = {
       {&insertItem_, "INSERT INTO items VALUES(?,?,?,?,?,?)"},
       {&insertFolder_, "INSERT INTO folders VALUES(?,?,?,?)"},
-      {&insertAttribute_, "INSERT OR IGNORE INTO attributes VALUES(?,?,?)"},
+      {&insertAttribute_, "INSERT OR REPLACE INTO attributes VALUES(?,?,?)"},
       {&insertFact_, "INSERT INTO facts VALUES(?,?)"},
       {&insertName_, "INSERT INTO attribute_names(name) VALUES(?)"},
       {&findName_, "SELECT id FROM attribute_names WHERE name=?"},
@@ -108,7 +126,7 @@ std::int64_t StoreWriter::add(const StoreItem& item) {
   }
   sqlite3_bind_int64(statement, 6, item.mtime);
   step(statement);
-  if (item.type >= usedTypes_.size()) usedTypes_.resize(item.type + 1);
+  if (item.type >= usedTypes_.size()) usedTypes_.resize(std::size_t{item.type} + 1);
   usedTypes_[item.type] = true;
   return nextId_++;
 }
@@ -127,7 +145,8 @@ void StoreWriter::addAttribute(std::int64_t item, std::string_view name, std::st
   sqlite3_stmt* statement = insertAttribute_.get();
   sqlite3_bind_int64(statement, 1, attributeNameId(name));
   sqlite3_bind_int64(statement, 2, item);
-  bindStoreValue(statement, 3, value);
+  const MetadataValue stored = parseSparseValue(value);
+  bindValue(statement, 3, stored);
   step(statement);
 }
 
@@ -157,7 +176,7 @@ Result<std::vector<StoreSubfolder>> StoreWriter::pendingFolders(std::int64_t fir
   sqlite3_bind_int64(statement, 2, end);
   int status = SQLITE_ROW;
   while (folders.size() < most && (status = sqlite3_step(statement)) == SQLITE_ROW) {
-    const auto type = static_cast<std::uint32_t>(sqlite3_column_int64(statement, 2));
+    const auto type = static_cast<TypeId>(sqlite3_column_int64(statement, 2));
     if (type >= isFolderType.size() || !isFolderType[type]) continue;
     const auto* name = static_cast<const char*>(sqlite3_column_blob(statement, 1));
     const auto length = static_cast<std::size_t>(sqlite3_column_bytes(statement, 1));
@@ -176,7 +195,7 @@ Result<void> StoreWriter::status() const {
   return {};
 }
 
-void StoreWriter::addType(std::uint32_t number, const StoreType& type) {
+void StoreWriter::addType(TypeId number, const ContentType& type) {
   const auto insertType = database_->prepare("INSERT INTO types VALUES(?,?,?)");
   const auto insertAncestor = database_->prepare("INSERT OR IGNORE INTO type_tree VALUES(?,?)");
   if (!insertType || !insertAncestor) {

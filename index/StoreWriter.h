@@ -13,6 +13,8 @@
 #include <unordered_map>
 #include <vector>
 
+#include "index/AccumulatedSizes.h"
+#include "index/ContentTypes.h"
 #include "index/StoreDatabase.h"
 #include "index/StoreSchema.h"
 #include "platform/Result.h"
@@ -22,15 +24,9 @@ namespace norvex {
 struct StoreItem {
   std::int64_t parent = 0;
   std::string_view name;
-  std::uint32_t type = 0;
+  TypeId type = 0;
   std::optional<std::int64_t> size;  // bytes; none for folders
   std::int64_t mtime = 0;            // nanoseconds since 1970
-};
-
-struct StoreType {
-  std::string identifier;
-  std::string kind;
-  std::vector<std::string> tree;  // what the type conforms to, itself included
 };
 
 struct StoreVolumeFacts {
@@ -39,13 +35,13 @@ struct StoreVolumeFacts {
   std::uint64_t files = 0;
   std::uint64_t folders = 0;
   std::uint64_t unreadable = 0;
-  StoreAccumulatedSizes accumulatedSizes{};
+  AccumulatedSizes::Values accumulatedSizes{};
 };
 
 struct StoreSubfolder {
   std::int64_t id = 0;
   std::string name;
-  std::uint32_t type = 0;
+  TypeId type = 0;
 };
 
 class StoreWriter {
@@ -62,7 +58,7 @@ class StoreWriter {
   void addFolder(std::int64_t folder, std::int64_t firstChild, std::int64_t childCount,
                  StoreFolderState state);
 
-  // A value that is a number is kept as one. An attribute that the item has already stays as it is.
+  // A value that is a number is kept as one. Replaces what the item has under this name.
   void addAttribute(std::int64_t item, std::string_view name, std::string_view value);
 
   // The folders among the items [first, end) that have no folder row yet, at most `most`. `isFolder` tells it
@@ -75,7 +71,7 @@ class StoreWriter {
 
   // Which types occur, by the numbers that were given to add().
   const std::vector<bool>& usedTypes() const { return usedTypes_; }
-  void addType(std::uint32_t number, const StoreType& type);
+  void addType(TypeId number, const ContentType& type);
 
   // Writes the facts, makes the index, has the store checked, stamps the moment of the check and seals the
   // file. The writer is of no more use afterwards.
