@@ -3,7 +3,6 @@
 #include <cerrno>
 
 #include "platform/linux/AbsentJobRegistry.h"
-#include "platform/linux/NoMediaMetadata.h"
 #include "platform/linux/SilentMemoryPressureSource.h"
 
 namespace norvex {
@@ -24,10 +23,6 @@ TEST(SilentMemoryPressureSource, CanBeSubscribedToAndStaysSilent) {
     events->resume();
   }
   EXPECT_EQ(calls, 0);
-}
-
-TEST(NoMediaMetadata, FindsNoItems) {
-  EXPECT_TRUE(NoMediaMetadata().itemKeys(Location::file("/music/song.m4a")).empty());
 }
 
 }  // namespace
