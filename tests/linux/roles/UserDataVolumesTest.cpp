@@ -60,7 +60,7 @@ TEST(UserDataVolumes, TheKindOfTheFileSystemDecides) {
   const char* const included[] = {"ext2",  "ext3",     "ext4",        "btrfs",    "xfs",   "f2fs",
                                   "jfs",   "reiserfs", "nilfs2",      "bcachefs", "zfs",   "ntfs",
                                   "ntfs3", "fuseblk",  "vfat",        "msdos",    "exfat", "hfs",
-                                  "apfs",  "hfsplus",  "fuseblk.ntfs"};
+                                  "jfs",   "hfsplus",  "fuseblk.ntfs"};
   const char* const leftOut[] = {
       "proc",        "sysfs",   "tmpfs", "ramfs",  "devtmpfs", "cgroup2",    "nfs",      "nfs4",
       "cifs",        "smb3",    "9p",    "ceph",   "fuse",     "fuse.sshfs", "autofs",   "squashfs",
