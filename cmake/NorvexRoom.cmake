@@ -42,6 +42,9 @@ function(norvex_room name)
   target_link_libraries(norvex_${name} PRIVATE ${ROOM_LIBRARIES})
 endfunction()
 
+# All threaded test programs, and so all that a build for the thread sanitizer needs.
+add_custom_target(norvex_threaded_tests)
+
 # norvex_test(NAME SOURCES a.cpp ... LIBRARIES norvex_x ... [THREADED])
 #
 # Declares the test program NAME and every test in it. THREADED gives its tests the label "threaded": they run
@@ -55,6 +58,7 @@ function(norvex_test name)
   set(labels "")
   if(TEST_THREADED)
     set(labels PROPERTIES LABELS threaded)
+    add_dependencies(norvex_threaded_tests ${name})
   endif()
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 60 ${labels})
 endfunction()

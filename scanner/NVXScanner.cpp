@@ -727,16 +727,16 @@ std::string NVXScanner::stringForOSType(std::uint32_t code) {
 
 std::set<std::string> NVXScanner::imapMailboxContent(const Location& home) {
   constexpr std::string_view layoutVersions[] = {"V2", "V3"};
-  const std::string mailFolder = normalizedPath(home.appending("Library/Mail/", true).path());
+  const Location mailFolder = Location::folder(normalizedPath(home.appending("Library/Mail/", true).path()));
   std::set<std::string> mailboxes;
   for (const std::string_view version : layoutVersions) {
-    const std::string versionFolder = mailFolder + "/" + std::string(version);
-    const auto names = platform().directoryListing.names(versionFolder);
+    const auto names = platform().directoryListing.names(mailFolder.appending(version, true).path());
     if (!names) continue;
     for (const std::string& name : *names) {
       // The path leaves the version folder out. That is what has always been measured; figures of two
       // releases could not be compared otherwise.
-      if (name.find("IMAP-") != std::string::npos) mailboxes.insert(mailFolder + "/" + name);
+      const bool isMailbox = name.find("IMAP-") != std::string::npos;
+      if (isMailbox) mailboxes.insert(mailFolder.appending(name, true).path());
     }
   }
   return mailboxes;

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 
 #include <algorithm>
+#include <cassert>
 #include <cerrno>
 
 namespace norvex {
@@ -15,6 +16,7 @@ void FolderDescriptors::keep(WalkedFolder& folder, FileDescriptor descriptor) {
 }
 
 FolderDescriptors::Descriptor FolderDescriptors::parentOf(WalkedFolder& folder, int& error) {
+  assert(folder.parent != nullptr);
   WalkedFolder& parent = *folder.parent;
   error = parent.descriptor ? 0 : reopen(parent);
   if (error == EMFILE || error == ENFILE) {
@@ -60,7 +62,11 @@ void FolderDescriptors::closeFirst(std::size_t count) {
 int FolderDescriptors::reopen(WalkedFolder& folder) {
   std::vector<WalkedFolder*> closed;
   WalkedFolder* lowestOpen = &folder;
-  for (; !lowestOpen->descriptor; lowestOpen = lowestOpen->parent) closed.push_back(lowestOpen);
+  while (!lowestOpen->descriptor) {
+    assert(lowestOpen->parent != nullptr && "the root stays open");
+    closed.push_back(lowestOpen);
+    lowestOpen = lowestOpen->parent;
+  }
 
   // The way back goes through the folders just above next, so these stay open as well: else leaving a tree
   // that is n folders deep would take n * n / 2 steps.

