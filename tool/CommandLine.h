@@ -1,0 +1,26 @@
+// What the user asked for, out of the arguments of the program.
+//
+// Called once by main.
+#pragma once
+
+#include <ostream>
+#include <variant>
+
+#include "tool/ExitStatus.h"
+#include "tool/IndexQueryCommand.h"
+#include "tool/IndexShowCommand.h"
+#include "tool/IndexStatusCommand.h"
+#include "tool/IndexUpdateCommand.h"
+
+namespace norvex {
+
+// One alternative a command.
+using CommandRequest =
+    std::variant<IndexUpdateRequest, IndexStatusRequest, IndexQueryRequest, IndexShowRequest>;
+
+// The command that was asked for; or the status to end with when nothing is left to do, because help was
+// asked for and written to `out`, or because `err` has been told what makes no sense.
+std::variant<CommandRequest, ExitStatus> parseCommandLine(int argc, const char* const* argv,
+                                                          std::ostream& out, std::ostream& err);
+
+}  // namespace norvex

@@ -1,0 +1,23 @@
+// From what was asked for to the command that does it.
+#pragma once
+
+#include <variant>
+
+#include "tool/CommandLine.h"
+
+namespace norvex {
+
+struct CommandRunner {
+  ToolWorld& world;
+
+  ExitStatus operator()(const IndexUpdateRequest& request) const { return runIndexUpdate(world, request); }
+  ExitStatus operator()(const IndexStatusRequest& request) const { return runIndexStatus(world, request); }
+  ExitStatus operator()(const IndexQueryRequest& request) const { return runIndexQuery(world, request); }
+  ExitStatus operator()(const IndexShowRequest& request) const { return runIndexShow(world, request); }
+};
+
+inline ExitStatus runCommand(ToolWorld& world, const CommandRequest& request) {
+  return std::visit(CommandRunner{world}, request);
+}
+
+}  // namespace norvex

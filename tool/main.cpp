@@ -1,0 +1,70 @@
+// The companion command: makes what the commands work with, and hands over to the one that was asked for.
+#include <unistd.h>
+
+#include <chrono>
+#include <clocale>
+#include <filesystem>
+#include <iostream>
+#include <string>
+#include <system_error>
+
+#include "platform/linux/ConfBackupSettings.h"
+#include "platform/linux/Environment.h"
+#include "platform/linux/LocaleByteCountFormatter.h"
+#include "platform/linux/SteadyClock.h"
+#include "platform/linux/XdgFolders.h"
+#include "tool/CommandLine.h"
+#include "tool/Commands.h"
+#include "tool/ConsoleSystemLog.h"
+#include "tool/MountPoints.h"
+#include "tool/StopSignals.h"
+
+namespace {
+
+std::int64_t secondsSince1970() {
+  using std::chrono::duration_cast, std::chrono::seconds, std::chrono::system_clock;
+  return duration_cast<seconds>(system_clock::now().time_since_epoch()).count();
+}
+
+std::string absolutePath(const std::string& path) {
+  std::error_code error;  // no working folder: the path stays as it is, and nothing is found there
+  const std::filesystem::path absolute = std::filesystem::absolute(path, error);
+  return error ? path : absolute.string();
+}
+
+norvex::ExitStatus run(int argc, const char* const* argv) {
+  using namespace norvex;
+  const auto parsed = parseCommandLine(argc, argv, std::cout, std::cerr);
+  if (const auto* status = std::get_if<ExitStatus>(&parsed)) return *status;
+  const auto& request = std::get<CommandRequest>(parsed);
+  // The other commands only read: the signals may end them at any moment.
+  if (std::holds_alternative<IndexUpdateRequest>(request)) takeStopSignals();
+
+  const Environment environment = processEnvironment();
+  const XdgFolders folders = XdgFolders::fromEnvironment(environment);
+  Console out(std::cout, ConsoleStyle::of(STDOUT_FILENO, environment));
+  Console err(std::cerr, ConsoleStyle::of(STDERR_FILENO, environment));
+  ConsoleSystemLog log(err);
+  ConfBackupSettings settings({folders.config, "/etc"}, log);
+  const LocaleByteCountFormatter byteCounts;
+  const SteadyClock clock;
+  const StoreFolder stores(folders.cache + "/norvex");
+  ToolWorld world{out,          err,          stores,       settings,    byteCounts, clock, secondsSince1970,
+                  isMountPoint, absolutePath, folders.data, stopWanted()};
+
+  ExitStatus status = runCommand(world, request);
+  worsen(status, log.status());
+  if (!std::cout.flush()) {
+    err.tell("the output could not be written to its end; is there room where it goes?");
+    worsen(status, ExitStatus::failed);
+  }
+  return status;
+}
+
+}  // namespace
+
+int main(int argc, char* argv[]) {
+  std::setlocale(LC_CTYPE, "");
+  std::ios::sync_with_stdio(false);
+  return static_cast<int>(run(argc, argv));
+}
