@@ -17,8 +17,8 @@ namespace {
 // How far a folder's subfolders are known ahead, and how many folders on the way down are looked at for such.
 constexpr std::size_t kKnownAhead = 16;
 constexpr std::size_t kFoldersLookedAhead = 64;
-constexpr std::size_t kFewWaiting = 8;  // below this more is given, so that no helper is ever idle
-constexpr std::size_t kMostWaiting = 32;
+constexpr std::size_t kFewWaiting = 32;  // below this more is given, so that no helper is ever idle
+constexpr std::size_t kMostWaiting = 128;
 constexpr std::size_t kMostHeldBytes = 8 * 1024 * 1024;
 
 // A subfolder whose turn comes.

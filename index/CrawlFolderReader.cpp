@@ -24,6 +24,7 @@ namespace norvex {
 namespace {
 
 constexpr std::size_t kEntriesBytes = 64 * 1024;
+constexpr std::size_t kUsualAttributes = 256;
 constexpr std::size_t kLongestAttribute = 64 * 1024;  // the kernel's limit of a list of names and of a value
 constexpr unsigned kWanted = STATX_TYPE | STATX_MODE | STATX_INO | STATX_SIZE | STATX_MTIME | STATX_MNT_ID;
 
@@ -103,6 +104,12 @@ Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const Craw
   return CrawlFolder{path, volume_.absolute(path), place, std::move(fd).value()};
 }
 
+CrawlNames& CrawlFolderReader::scratchNames() {
+  scratchNames_.bytes.clear();
+  scratchNames_.starts.clear();
+  return scratchNames_;
+}
+
 Result<bool> CrawlFolderReader::list(CrawlFolder& folder, CrawlNames& names, std::size_t mostBytes) {
   const auto sortNames = [&names] {
     std::sort(names.starts.begin(), names.starts.end(), [bytes = names.bytes.data()](auto left, auto right) {
@@ -142,7 +149,12 @@ const char* CrawlFolderReader::attributePath(const CrawlFolder& folder, const ch
 void CrawlFolderReader::readItems(const CrawlFolder& folder, const CrawlNames& names, std::size_t first,
                                   std::size_t end, CrawlBatch& batch) {
   makeCurrent(folder);
-  batch.items.reserve(batch.items.size() + (end - first));
+  // Made in one piece each: the writer gives back what a worker has allocated, and each time one waits for
+  // the other.
+  batch.items.reserve(end - first);
+  std::size_t nameBytes = 0;
+  for (std::size_t index = first; index < end; ++index) nameBytes += std::strlen(names.at(index));
+  batch.names.reserve(nameBytes);
   for (std::size_t index = first; index < end; ++index) {
     const char* name = names.at(index);
     readItem(folder, name, name, batch);
@@ -191,8 +203,10 @@ CrawlFolderReader::OwnAttributes CrawlFolderReader::readAttributes(const CrawlFo
                                                                    std::uint32_t item, CrawlBatch& batch) {
   OwnAttributes own;
   if (!volume_.hasAttributes()) return own;
-  const ssize_t size =
-      ::llistxattr(attributePath(folder, name), attributeNames_.data(), attributeNames_.size());
+  const char* path = attributePath(folder, name);
+  // The kernel allocates what it is told that there is room for, so the usual case asks for little.
+  ssize_t size = ::llistxattr(path, attributeNames_.data(), kUsualAttributes);
+  if (size < 0 && errno == ERANGE) size = ::llistxattr(path, attributeNames_.data(), attributeNames_.size());
   if (size < 0 && errno == ENOTSUP) volume_.noteNoAttributes();
   for (ssize_t offset = 0; offset < size;) {
     const char* attribute = attributeNames_.data() + offset;

@@ -51,6 +51,9 @@ class CrawlFolderReader {
   // errno on failure; EXDEV for a folder in which another volume, or a read-only snapshot, begins.
   Result<CrawlFolder> enter(const std::string& path, const CrawlPlace& place);
 
+  // Empty names, in memory that is used again and again.
+  CrawlNames& scratchNames();
+
   // Appends names until there are no more, or until they take about `mostBytes`, and sorts them. True at the
   // folder's end. errno on failure; what was read until then stands in `names`.
   Result<bool> list(CrawlFolder& folder, CrawlNames& names, std::size_t mostBytes);
@@ -83,6 +86,7 @@ class CrawlFolderReader {
   const CrawlRules& rules_;
   bool hasOwnCurrentFolder_;
   bool isCurrent_ = false;  // of the folder whose items are being read
+  CrawlNames scratchNames_;
   std::string attributePath_;
   std::vector<char> entries_, attributeNames_, attributeValue_;
 };

@@ -10,7 +10,7 @@ void CrawlFolderTask::run(CrawlFolderReader& reader) {
     error = folder.error();
     return;
   }
-  CrawlNames names;
+  CrawlNames& names = reader.scratchNames();
   const Result<bool> listed = reader.list(folder.value(), names, kMostNameBytes);
   if (listed.ok() && !listed.value()) {
     isLarge = true;

@@ -1,6 +1,28 @@
 #include "index/StoreDatabase.h"
 
+#include <array>
+#include <cstdio>
+
 namespace norvex {
+namespace {
+
+std::string uriOf(const std::string& path) {
+  static constexpr std::string_view kPlain =
+      "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789/-_.";
+  std::string uri = "file:";
+  std::array<char, 8> piece{};
+  for (const char letter : path) {
+    if (kPlain.find(letter) != std::string_view::npos) {
+      uri += letter;
+      continue;
+    }
+    std::snprintf(piece.data(), piece.size(), "%%%02X", static_cast<unsigned char>(letter));
+    uri += piece.data();
+  }
+  return uri + "?immutable=1";
+}
+
+}  // namespace
 
 Error damagedStore(const std::string& what) {
   return Error{kStoreDamaged, "the store is damaged (" + what + "); `norvexctl index update` makes it anew"};
@@ -19,6 +41,11 @@ Result<StoreDatabase> StoreDatabase::open(const std::string& path, int flags) {
   if (status != SQLITE_OK) return database.lastError();
   sqlite3_extended_result_codes(connection, 1);
   return database;
+}
+
+Result<StoreDatabase> StoreDatabase::openImmutable(const std::string& path) {
+  return open(uriOf(path),
+              SQLITE_OPEN_READONLY | SQLITE_OPEN_URI | SQLITE_OPEN_FULLMUTEX | SQLITE_OPEN_PRIVATECACHE);
 }
 
 Result<void> StoreDatabase::run(const char* sql) {

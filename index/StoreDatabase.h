@@ -33,6 +33,9 @@ class StoreDatabase {
   // Opens `path` with SQLite's open flags. Reads nothing yet.
   static Result<StoreDatabase> open(const std::string& path, int flags);
 
+  // Opens a file whose pages do not change any more, to read it. Takes no locks. Reads nothing yet.
+  static Result<StoreDatabase> openImmutable(const std::string& path);
+
   // Runs statements that give no rows.
   Result<void> run(const char* sql);
 

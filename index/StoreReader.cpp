@@ -6,7 +6,6 @@
 #include <array>
 #include <cerrno>
 #include <charconv>
-#include <cstdio>
 #include <cstring>
 #include <span>
 #include <utility>
@@ -28,22 +27,6 @@ constexpr std::int64_t kBytesPerWorkUnit = 20;
 constexpr std::size_t kHeaderBytes = 100;
 constexpr std::string_view kHeaderMagic("SQLite format 3\0", 16);
 constexpr std::size_t kUserVersionOffset = 60;
-
-std::string uriOf(const std::string& path) {
-  static constexpr std::string_view kPlain =
-      "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789/-_.";
-  std::string uri = "file:";
-  std::array<char, 8> piece{};
-  for (const char letter : path) {
-    if (kPlain.find(letter) != std::string_view::npos) {
-      uri += letter;
-      continue;
-    }
-    std::snprintf(piece.data(), piece.size(), "%%%02X", static_cast<unsigned char>(letter));
-    uri += piece.data();
-  }
-  return uri + "?immutable=1";
-}
 
 std::optional<std::int64_t> numberOf(std::string_view text) {
   std::int64_t number = 0;
@@ -70,8 +53,7 @@ Result<std::unique_ptr<StoreReader>> StoreReader::open(const StoreFolder& folder
   if (::lstat(path.c_str(), &status) != 0) return systemError(errno);
   if (!S_ISREG(status.st_mode))
     return damagedStore("no regular file");  // opening a pipe would wait for its other end
-  auto database = StoreDatabase::open(
-      uriOf(path), SQLITE_OPEN_READONLY | SQLITE_OPEN_URI | SQLITE_OPEN_FULLMUTEX | SQLITE_OPEN_PRIVATECACHE);
+  auto database = StoreDatabase::openImmutable(path);
   if (!database) return database.error();
   std::unique_ptr<StoreReader> reader(new StoreReader(std::move(database).value()));
   if (const auto checked = reader->checkFile(check); !checked) return checked.error();

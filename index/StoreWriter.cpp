@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <thread>
 #include <utility>
 #include <variant>
 
@@ -52,10 +53,44 @@ std::string joined(const AccumulatedSizes::Values& sizes) {
   return text;
 }
 
+void watch(StoreDatabase& database, const std::atomic<bool>& cancelled) {
+  const auto isCancelled = [](void* flag) {
+    return static_cast<const std::atomic<bool>*>(flag)->load(std::memory_order_relaxed) ? 1 : 0;
+  };
+  sqlite3_progress_handler(database.handle(), kInstructionsBetweenLooks, isCancelled,
+                           const_cast<std::atomic<bool>*>(&cancelled));
+}
+
+Result<std::string> firstText(StoreDatabase& database, const char* sql) {
+  auto statement = database.prepare(sql);
+  if (!statement) return statement.error();
+  if (sqlite3_step(statement.value().get()) != SQLITE_ROW) return database.lastError();
+  return std::string(storeBytes(statement.value().get(), 0));
+}
+
+// Another connection to the file, which has read what is in it now: the tables, but no index that is made
+// afterwards.
+Result<StoreDatabase> openForCheck(const std::string& path, const std::atomic<bool>& cancelled) {
+  auto database = StoreDatabase::openImmutable(path);
+  if (!database) return database;
+  watch(database.value(), cancelled);
+  if (const auto begun = database.value().run("BEGIN; SELECT count(*) FROM sqlite_schema"); !begun)
+    return begun.error();
+  return database;
+}
+
+// Whether every page is sound.
+Result<void> checkPages(StoreDatabase& database) {
+  const auto structure = firstText(database, "PRAGMA quick_check(1)");
+  if (!structure) return structure.error();
+  if (structure.value() != "ok") return damagedStore("the new one: " + structure.value());
+  return {};
+}
+
 }  // namespace
 
-StoreWriter::StoreWriter(std::string path, StoreDatabase database)
-    : path_(std::move(path)), database_(std::move(database)) {}
+StoreWriter::StoreWriter(std::string path, StoreDatabase database, const std::atomic<bool>& cancelled)
+    : path_(std::move(path)), database_(std::move(database)), cancelled_(&cancelled) {}
 
 Result<StoreWriter> StoreWriter::create(const std::string& path, const std::atomic<bool>& cancelled) {
   if (::unlink(path.c_str()) != 0 && errno != ENOENT) return systemError(errno);
@@ -65,18 +100,10 @@ Result<StoreWriter> StoreWriter::create(const std::string& path, const std::atom
   }
   auto database = StoreDatabase::open(path, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX);
   if (!database) return database.error();
-  StoreWriter writer(path, std::move(database).value());
-  writer.watch(cancelled);
+  watch(database.value(), cancelled);
+  StoreWriter writer(path, std::move(database).value(), cancelled);
   if (const auto begun = writer.begin(); !begun) return begun.error();
   return writer;
-}
-
-void StoreWriter::watch(const std::atomic<bool>& cancelled) {
-  const auto isCancelled = [](void* flag) {
-    return static_cast<const std::atomic<bool>*>(flag)->load(std::memory_order_relaxed) ? 1 : 0;
-  };
-  sqlite3_progress_handler(database_->handle(), kInstructionsBetweenLooks, isCancelled,
-                           const_cast<std::atomic<bool>*>(&cancelled));
 }
 
 Result<void> StoreWriter::begin() {
@@ -241,23 +268,28 @@ Result<void> StoreWriter::makeIndexes() {
     if (object.kind != "index") continue;
     if (const auto made = database_->run(object.sql); !made) return made;
   }
-  return database_->run("COMMIT");
+  return {};
 }
 
-Result<void> StoreWriter::check(const StoreVolumeFacts& facts) {
-  const auto text = [this](const char* sql) -> std::string {
-    auto statement = database_->prepare(sql);
-    if (!statement || sqlite3_step(statement.value().get()) != SQLITE_ROW)
-      return database_->lastError().description;
-    return reinterpret_cast<const char*>(sqlite3_column_text(statement.value().get(), 0));
-  };
-  const std::string structure = text("PRAGMA quick_check(1)");
-  if (structure != "ok") return Error{kStoreDamaged, "the new store is damaged: " + structure};
-  const std::string items = std::to_string(facts.files + facts.folders + 1);
+// Two threads at once: the tables have been written, and what is added now does not touch their pages.
+Result<void> StoreWriter::makeCheckedIndexes() {
+  auto tables = openForCheck(path_, *cancelled_);
+  if (!tables) return tables.error();
+  Result<void> checked;
+  std::thread check([&] { checked = checkPages(tables.value()); });
+  const Result<void> made = makeIndexes();
+  check.join();
+  return checked ? made : checked;
+}
+
+Result<void> StoreWriter::checkCounts(std::uint64_t items) {
   for (const char* sql :
        {"SELECT count(*) FROM items NOT INDEXED", "SELECT count(*) FROM items INDEXED BY items_by_type"}) {
-    if (const std::string count = text(sql); count != items) {
-      return Error{kStoreDamaged, "the new store holds " + count + " items instead of " + items};
+    const auto count = firstText(*database_, sql);
+    if (!count) return count.error();
+    if (count.value() != std::to_string(items)) {
+      return damagedStore("the new one holds " + count.value() + " items instead of " +
+                          std::to_string(items));
     }
   }
   return {};
@@ -276,8 +308,9 @@ Result<void> StoreWriter::closeAndSeal() {
 
 Result<void> StoreWriter::finish(const StoreVolumeFacts& facts, std::int64_t healthCheckTime) {
   if (const auto written = writeFacts(facts); !written) return written;
-  if (const auto made = makeIndexes(); !made) return made;
-  if (const auto checked = check(facts); !checked) return checked;
+  if (const auto committed = database_->run("COMMIT"); !committed) return committed;
+  if (const auto made = makeCheckedIndexes(); !made) return made;
+  if (const auto checked = checkCounts(facts.files + facts.folders + 1); !checked) return checked;
   setFact(kFactHealthCheck, healthCheckTime);
   if (failure_) return *failure_;
   return closeAndSeal();
@@ -286,6 +319,7 @@ Result<void> StoreWriter::finish(const StoreVolumeFacts& facts, std::int64_t hea
 Result<void> StoreWriter::finishEmpty(const StoreVolumeFacts& facts) {
   if (const auto written = writeFacts(facts); !written) return written;
   if (const auto made = makeIndexes(); !made) return made;
+  if (const auto committed = database_->run("COMMIT"); !committed) return committed;
   return closeAndSeal();
 }
 

@@ -82,18 +82,18 @@ class StoreWriter {
   Result<void> finishEmpty(const StoreVolumeFacts& facts);
 
  private:
-  StoreWriter(std::string path, StoreDatabase database);
+  StoreWriter(std::string path, StoreDatabase database, const std::atomic<bool>& cancelled);
 
   Result<void> begin();
   Result<void> writeFacts(const StoreVolumeFacts& facts);
   Result<void> makeIndexes();
-  Result<void> check(const StoreVolumeFacts& facts);
+  Result<void> makeCheckedIndexes();
+  Result<void> checkCounts(std::uint64_t items);
   Result<void> closeAndSeal();
   std::int64_t attributeNameId(std::string_view name);
   void setFact(std::string_view name, std::string_view text);
   void setFact(std::string_view name, std::int64_t number);
   void step(sqlite3_stmt* statement);
-  void watch(const std::atomic<bool>& cancelled);
 
   std::string path_;
   std::optional<StoreDatabase> database_;
@@ -102,6 +102,7 @@ class StoreWriter {
   std::unordered_map<std::string, std::int64_t> nameIds_;
   std::vector<bool> usedTypes_;
   std::int64_t nextId_ = kRootItem;
+  const std::atomic<bool>* cancelled_;
   std::optional<Error> failure_;
 };
 
