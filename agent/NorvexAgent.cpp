@@ -1,6 +1,8 @@
 // The program: makes the roles as this machine plays them, and hands over to the entry.
 #include "agent/main.h"
-#include "index/UnindexedVolumes.h"
+#include "index/StoreFolder.h"
+#include "index/StoredMetadataIndex.h"
+#include "index/VolumeStores.h"
 #include "platform/Platform.h"
 #include "platform/linux/Environment.h"
 #include "platform/linux/LinuxActivityScheduler.h"
@@ -11,8 +13,10 @@ int main(int argc, char* argv[]) {
   norvex::LinuxActivityScheduler::blockRunSignal();
 
   norvex::LinuxPlatform linuxPlatform(argc, argv, norvex::processEnvironment());
-  norvex::UnindexedVolumes metadataIndex(linuxPlatform.eventLoops());
-  const norvex::Platform roles = linuxPlatform.roles(metadataIndex);
+  norvex::VolumeStores stores(norvex::StoreFolder(linuxPlatform.folders().cache + "/norvex"));
+  norvex::StoredMetadataIndex metadataIndex(stores, linuxPlatform.eventLoops());
+  norvex::StoredVolumeCatalog volumeCatalog(stores, linuxPlatform.volumeCatalog());
+  const norvex::Platform roles = linuxPlatform.roles(metadataIndex, volumeCatalog);
   const norvex::ScopedPlatform installed(roles);
   return norvex::main();
 }

@@ -1,7 +1,7 @@
 // The scanner on the roles of Linux, for measuring its walks as the agent makes them.
 #pragma once
 
-#include "index/UnindexedVolumes.h"
+#include "index/StoredMetadataIndex.h"
 #include "platform/Platform.h"
 #include "platform/linux/LinuxPlatform.h"
 #include "scanner/NVXScanner.h"
@@ -10,7 +10,7 @@ namespace norvex::bench {
 
 class MeasuredScanner {
  public:
-  MeasuredScanner() : linux_(0, nullptr, processEnvironment()), index_(linux_.eventLoops()) {}
+  MeasuredScanner() : linux_(0, nullptr, processEnvironment()) {}
 
   std::uint64_t sizeOf(const Location& folder) { return scanner_.sizeForDirectory(folder); }
 
@@ -45,8 +45,9 @@ class MeasuredScanner {
 
  private:
   LinuxPlatform linux_;
-  UnindexedVolumes index_;
-  const Platform roles_ = linux_.roles(index_);
+  VolumeStores stores_{StoreFolder(linux_.folders().cache + "/norvex")};
+  StoredMetadataIndex index_{stores_, linux_.eventLoops()};
+  const Platform roles_ = linux_.roles(index_, linux_.volumeCatalog());
   const ScopedPlatform installed_{roles_};
   NVXScanner scanner_;
 };

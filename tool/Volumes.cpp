@@ -81,17 +81,8 @@ std::optional<std::vector<std::string>> chosenVolumes(const ToolWorld& world,
   return volumes;
 }
 
-bool hasStoreFile(const StoreFolder& stores, const std::string& volume) {
-  struct stat status {};
-  return ::lstat(stores.storePath(volume).c_str(), &status) == 0;
-}
-
 std::string volumeOf(const ToolWorld& world, const std::string& path) {
-  std::string folder = path;
-  while (folder.size() > 1 && !world.isMountPoint(folder) && !hasStoreFile(world.stores, folder)) {
-    folder.resize(std::max<std::size_t>(folder.rfind('/'), 1));
-  }
-  return folder;
+  return volumeRootOf(world.stores, world.isMountPoint, path);
 }
 
 std::variant<std::unique_ptr<StoreReader>, StoreFault> openStore(const StoreFolder& stores,

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "index/StoreReader.h"
+#include "index/VolumeStores.h"
 #include "tool/ToolWorld.h"
 
 namespace norvex {
@@ -22,9 +23,6 @@ std::optional<std::vector<std::string>> chosenVolumes(const ToolWorld& world,
 // The volume that an absolute path lies on, as far as stores go: the nearest folder above it, or itself, that
 // is a mount point or has a store. "/" at the last.
 std::string volumeOf(const ToolWorld& world, const std::string& path);
-
-// Whether there is a file for the volume's store, whatever is in it.
-bool hasStoreFile(const StoreFolder& stores, const std::string& volume);
 
 // Why a volume's store is of no use. The kinds are what JSON calls "reason".
 struct StoreFault {

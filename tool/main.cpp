@@ -8,6 +8,7 @@
 #include <string>
 #include <system_error>
 
+#include "index/MountPoints.h"
 #include "platform/linux/ConfBackupSettings.h"
 #include "platform/linux/Environment.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
@@ -16,7 +17,6 @@
 #include "tool/CommandLine.h"
 #include "tool/Commands.h"
 #include "tool/ConsoleSystemLog.h"
-#include "tool/MountPoints.h"
 #include "tool/StopSignals.h"
 
 namespace {

@@ -20,7 +20,7 @@ LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environmen
       preferenceStore_(folders_.config + kOwnFolder),
       activityScheduler_(environment) {}
 
-Platform LinuxPlatform::roles(MetadataIndex& metadataIndex) {
+Platform LinuxPlatform::roles(MetadataIndex& metadataIndex, VolumeCatalog& volumeCatalog) {
   return {.activityScheduler = activityScheduler_,
           .backupSettings = backupSettings_,
           .byteCountFormatter = byteCountFormatter_,
@@ -42,7 +42,7 @@ Platform LinuxPlatform::roles(MetadataIndex& metadataIndex) {
           .systemControl = systemControl_,
           .systemLog = systemLog_,
           .userFolders = userFolders_,
-          .volumeCatalog = volumeCatalog_};
+          .volumeCatalog = volumeCatalog};
 }
 
 }  // namespace norvex

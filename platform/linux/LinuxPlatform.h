@@ -38,12 +38,13 @@ class LinuxPlatform {
   LinuxPlatform(const LinuxPlatform&) = delete;
   LinuxPlatform& operator=(const LinuxPlatform&) = delete;
 
-  // References to the roles of this object and to the index, which is the one role that is made elsewhere.
+  // References to the roles of this object and to the two that are made elsewhere, of an index.
   // Both outlive whoever uses the set.
-  Platform roles(MetadataIndex& metadataIndex);
+  Platform roles(MetadataIndex& metadataIndex, VolumeCatalog& volumeCatalog);
 
   // What an index is made of.
   EventLoops& eventLoops() { return eventLoops_; }
+  VolumeCatalog& volumeCatalog() { return volumeCatalog_; }
   const XdgFolders& folders() const { return folders_; }
 
  private:

@@ -6,7 +6,7 @@
 #include <future>
 #include <thread>
 
-#include "index/UnindexedVolumes.h"
+#include "index/StoredQuery.h"
 #include "tests/support/TestPlatform.h"
 
 namespace norvex {
@@ -17,7 +17,8 @@ using ::testing::ElementsAre;
 // Any query will do: observers are handed it and nothing more.
 struct Fixture {
   TestPlatform world;
-  std::unique_ptr<MetadataQuery> query = UnindexedVolumes(world.eventLoops).createQuery();
+  VolumeStores stores{StoreFolder("/nonexistent")};
+  std::unique_ptr<MetadataQuery> query = makeStoredQuery(stores, world.eventLoops);
   FinishObservers observers;
 };
 

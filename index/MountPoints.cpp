@@ -1,4 +1,4 @@
-#include "tool/MountPoints.h"
+#include "index/MountPoints.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>

@@ -1,0 +1,156 @@
+#include "index/StoredQuery.h"
+
+#include <sqlite3.h>
+
+#include <atomic>
+#include <utility>
+
+#include "index/FinishObservers.h"
+#include "index/PredicateFunctions.h"
+#include "index/PredicateParser.h"
+#include "index/PredicateSql.h"
+
+namespace norvex {
+namespace {
+
+// Few enough that the loop comes to its other inputs soon, many enough that the turns of the loop cost
+// nothing.
+constexpr int kRowsPerBatch = 4096;
+
+// The matches in one store: what is still to be stepped through, and what has been found.
+struct StoreMatches {
+  StoreReader* store;
+  StoreStatement rows;  // nullptr once all have been found
+  std::vector<std::int64_t> items;
+};
+
+// What a query and its pending inputs share, so that an input may come late.
+struct Gathering {
+  explicit Gathering(VolumeStores& itsStores) : stores(itsStores) {}
+
+  VolumeStores& stores;
+  std::vector<StoreMatches> matches;
+  FinishObservers observers;
+  std::atomic<bool> stopped{false};
+};
+
+// Takes up to a batch of rows. False when there are no more.
+bool gatherBatch(Gathering& gathering, StoreMatches& found) {
+  for (int row = 0; row < kRowsPerBatch; ++row) {
+    const int status = sqlite3_step(found.rows.get());
+    if (status == SQLITE_ROW) {
+      found.items.push_back(sqlite3_column_int64(found.rows.get(), 0));
+      continue;
+    }
+    // What has been found so far stands; the next query over this store does not start.
+    if (status != SQLITE_DONE) gathering.stores.giveUp(*found.store, found.store->lastError());
+    found.rows.reset();
+    return false;
+  }
+  return true;
+}
+
+class StoredQuery final : public MetadataQuery {
+ public:
+  StoredQuery(VolumeStores& stores, EventLoops& loops)
+      : loops_(loops), gathering_(std::make_shared<Gathering>(stores)) {}
+  // An input that comes later must not touch the query.
+  ~StoredQuery() override { gathering_->stopped.store(true, std::memory_order_release); }
+
+  void setPredicate(std::string predicate) override { predicate_ = std::move(predicate); }
+  // Every attribute of a match is at hand anyway.
+  void setValueListAttributes(std::vector<std::string>) override {}
+  void setSearchScopes(std::vector<Location> scopes) override { scopes_ = std::move(scopes); }
+
+  ObserverToken addFinishObserver(FinishObserver observer) override {
+    return gathering_->observers.add(std::move(observer));
+  }
+  void removeFinishObserver(ObserverToken token) override { gathering_->observers.remove(token); }
+
+  bool start() override;
+  void stop() override;
+  bool isStopped() const override { return gathering_->stopped.load(std::memory_order_acquire); }
+
+  std::size_t resultCount() const override;
+  std::unique_ptr<MetadataResult> resultAtIndex(std::size_t index) const override;
+
+ private:
+  bool addScope(const Location& scope, const PredicateSql& sql);
+  void gather();
+
+  EventLoops& loops_;
+  EventLoop* startingLoop_ = nullptr;
+  std::string predicate_;
+  std::vector<Location> scopes_;
+  std::shared_ptr<Gathering> gathering_;
+};
+
+bool StoredQuery::start() {
+  const auto parsed = parsePredicate(predicate_);
+  const auto* predicate = std::get_if<Predicate>(&parsed);
+  if (predicate == nullptr) return false;
+  const PredicateSql sql = compilePredicate(*predicate);
+  for (const Location& scope : scopes_) {
+    if (!addScope(scope, sql)) return false;
+  }
+  startingLoop_ = &loops_.current();
+  gather();
+  return true;
+}
+
+// False when the scope's store cannot be searched. A volume without a store is searched in vain.
+bool StoredQuery::addScope(const Location& scope, const PredicateSql& sql) {
+  const auto store = gathering_->stores.storeOf(scope.path());
+  if (!store.ok()) return store.error().code == kStoreMissing;
+  auto rows = store.value()->prepare("SELECT i.id FROM items AS i WHERE " + sql.where + " ORDER BY i.id");
+  if (!rows.ok() || !bindPredicateValues(rows.value().get(), sql).ok()) return false;
+  gathering_->matches.push_back({store.value(), std::move(rows).value(), {}});
+  return true;
+}
+
+// Queues the next batch; the last one queues the end of the gathering on the main loop.
+void StoredQuery::gather() {
+  startingLoop_->post([this, gathering = gathering_] {
+    if (gathering->stopped.load(std::memory_order_acquire)) return;  // `this` may be gone
+    for (StoreMatches& found : gathering->matches) {
+      if (found.rows == nullptr) continue;
+      gatherBatch(*gathering, found);
+      return gather();
+    }
+    // Whoever drops a query before its end has removed his observers, and nobody is told.
+    loops_.main().post([this, gathering] { gathering->observers.notify(*this); });
+  });
+}
+
+void StoredQuery::stop() {
+  gathering_->stopped.store(true, std::memory_order_release);
+  if (startingLoop_ != nullptr) startingLoop_->post([] {});  // ends the pass that waits for the gathering
+}
+
+std::size_t StoredQuery::resultCount() const {
+  std::size_t count = 0;
+  for (const StoreMatches& found : gathering_->matches) count += found.items.size();
+  return count;
+}
+
+std::unique_ptr<MetadataResult> StoredQuery::resultAtIndex(std::size_t index) const {
+  for (const StoreMatches& found : gathering_->matches) {
+    if (index < found.items.size()) return std::make_unique<StoredResult>(*found.store, found.items[index]);
+    index -= found.items.size();
+  }
+  return nullptr;
+}
+
+}  // namespace
+
+std::unique_ptr<MetadataQuery> makeStoredQuery(VolumeStores& stores, EventLoops& loops) {
+  return std::make_unique<StoredQuery>(stores, loops);
+}
+
+std::optional<MetadataValue> StoredResult::valueForAttribute(std::string_view attribute) const {
+  auto value = store_.attribute(item_, attribute);
+  if (!value.ok()) return std::nullopt;
+  return std::move(value).value();
+}
+
+}  // namespace norvex
