@@ -4,9 +4,9 @@
 #include <cstdio>
 #include <type_traits>
 
+#include "tool/FigureText.h"
 #include "tool/SafeText.h"
 #include "tool/StoragePositionNames.h"
-#include "tool/TimeText.h"
 
 namespace norvex {
 namespace {

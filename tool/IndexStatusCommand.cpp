@@ -3,11 +3,11 @@
 #include <sys/stat.h>
 
 #include "tool/Faults.h"
+#include "tool/FigureText.h"
 #include "tool/JsonText.h"
 #include "tool/SafeText.h"
 #include "tool/SizeBars.h"
 #include "tool/StoragePositionNames.h"
-#include "tool/TimeText.h"
 #include "tool/Volumes.h"
 
 namespace norvex {
@@ -36,8 +36,8 @@ void writeText(ToolWorld& world, const VolumeStatus& status) {
   out.stream() << out.inked(Console::Ink::bold, safeText(status.root)) << '\n'
                << label("Updated     ") << localTime(status.updated) << " ("
                << ageText(world.secondsSince1970() - status.updated) << ")\n"
-               << label("Items       ") << counts.files + counts.folders << " (" << counts.files << " files, "
-               << counts.folders << " folders)\n"
+               << label("Items       ") << counts.files + counts.folders << " ("
+               << countText(counts.files, "file") << ", " << countText(counts.folders, "folder") << ")\n"
                << label("Unreadable  ") << counts.unreadable << '\n'
                << label("Index       ") << world.byteCounts.string(status.storeBytes) << "\n\n";
   writeSizeBars(out, world.byteCounts, status.sizes);

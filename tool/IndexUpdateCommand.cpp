@@ -7,9 +7,9 @@
 #include "index/CrawlRules.h"
 #include "index/IndexUpdate.h"
 #include "tool/Faults.h"
+#include "tool/FigureText.h"
 #include "tool/JsonText.h"
 #include "tool/SafeText.h"
-#include "tool/TimeText.h"
 #include "tool/UpdateProgress.h"
 #include "tool/Volumes.h"
 
@@ -92,9 +92,10 @@ class IndexUpdateCommand {
     tellProblems(volume, summary.update.figures.problems);
     if (request_.json) return keepForJson(volume, summary);
     const CrawlFigures& figures = summary.update.figures;
-    world_.out.stream() << safeText(volume) << ": " << summary.items() << " items (" << figures.files
-                        << " files, " << figures.folders << " folders) in " << secondsText(summary.elapsed)
-                        << " s (" << perSecond(summary.items(), summary.elapsed) << " items/s), "
+    world_.out.stream() << safeText(volume) << ": " << countText(summary.items(), "item") << " ("
+                        << countText(figures.files, "file") << ", " << countText(figures.folders, "folder")
+                        << ") in " << secondsText(summary.elapsed) << " s ("
+                        << perSecond(summary.items(), summary.elapsed) << " items/s), "
                         << figures.problems.count << " unreadable, index "
                         << world_.byteCounts.string(summary.update.storeBytes) << std::endl;
   }
@@ -102,8 +103,7 @@ class IndexUpdateCommand {
   void tellProblems(const std::string& volume, const CrawlProblems& problems) {
     if (problems.count == 0) return;
     world_.err.tell(safeText(volume) + ": could not be read and " + (problems.count == 1 ? "is" : "are") +
-                    " not in the index: " + std::to_string(problems.count) +
-                    (problems.count == 1 ? " item" : " items"));
+                    " not in the index: " + countText(problems.count, "item"));
     std::uint64_t shown = 0;
     for (const CrawlProblem& problem : problems.first) {
       if (shown == kMostProblemsShown) break;

@@ -2,8 +2,8 @@
 
 #include <numeric>
 
+#include "tool/FigureText.h"
 #include "tool/SafeText.h"
-#include "tool/TimeText.h"
 
 namespace norvex {
 namespace {
@@ -49,8 +49,8 @@ void UpdateProgress::show(const CrawlFigures& figures) {
 void UpdateProgress::write(const CrawlFigures& figures, Clock::Moment now) {
   const auto elapsed = now - started_;
   const std::string line = safeText(volume_) + "  " + elapsedText(elapsed) + "  " +
-                           std::to_string(figures.files) + " files, " + std::to_string(figures.folders) +
-                           " folders, " + byteCounts_.string(sumOf(figures.accumulatedSizes)) + ", " +
+                           countText(figures.files, "file") + ", " + countText(figures.folders, "folder") +
+                           ", " + byteCounts_.string(sumOf(figures.accumulatedSizes)) + ", " +
                            std::to_string(perSecond(figures.files + figures.folders, elapsed)) + " items/s";
   // The last column stays free: some terminals go to the next line once it is filled.
   console_.stream() << std::string(kEraseLine) + fittingText(line, console_.style().width - 1) << std::flush;

@@ -1,4 +1,4 @@
-// Moments and durations as people and programs read them.
+// Moments, durations and counts as people and programs read them.
 //
 // Any thread. The user's time zone is the environment's TZ.
 #pragma once
@@ -23,5 +23,8 @@ std::string elapsedText(std::chrono::duration<double> elapsed);
 
 // "12.3"
 std::string secondsText(std::chrono::duration<double> elapsed);
+
+// "1 folder", "2 folders"; `thing` is the singular.
+std::string countText(std::uint64_t count, const std::string& thing);
 
 }  // namespace norvex

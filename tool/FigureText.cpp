@@ -1,4 +1,4 @@
-#include "tool/TimeText.h"
+#include "tool/FigureText.h"
 
 #include <time.h>
 
@@ -67,6 +67,10 @@ std::string secondsText(std::chrono::duration<double> elapsed) {
   std::array<char, 48> text{};
   std::snprintf(text.data(), text.size(), "%.1f", elapsed.count());
   return text.data();
+}
+
+std::string countText(std::uint64_t count, const std::string& thing) {
+  return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
 }
 
 }  // namespace norvex
