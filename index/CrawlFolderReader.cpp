@@ -96,8 +96,9 @@ CrawlFolderReader::CrawlFolderReader(const CrawlVolume& volume, const CrawlRules
       attributeNames_(kLongestAttribute),
       attributeValue_(kLongestAttribute) {}
 
-Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const CrawlPlace& place) {
-  auto fd = volume_.openFolder(path);
+Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const CrawlPlace& place,
+                                             const KeptFolder& around) {
+  auto fd = volume_.openFolder(path, around);
   if (!fd) return fd.error();
   if (volume_.mayHaveSnapshots() && !path.empty() && isReadOnlySnapshot(fd.value().get()))
     return systemError(EXDEV);

@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "index/CrawlBatch.h"
@@ -49,7 +50,16 @@ class CrawlFolderReader {
   CrawlFolderReader(const CrawlVolume& volume, const CrawlRules& rules);
 
   // errno on failure; EXDEV for a folder in which another volume, or a read-only snapshot, begins.
-  Result<CrawlFolder> enter(const std::string& path, const CrawlPlace& place);
+  Result<CrawlFolder> enter(const std::string& path, const CrawlPlace& place, const KeptFolder& around);
+
+  // Keeps a folder open for those in it, unless too many are.
+  KeptFolder keep(CrawlFolder folder) const { return volume_.keep(std::move(folder.fd)); }
+
+  // What the folder at `path` below the root passes on to its items.
+  CrawlPlace placeInside(std::string_view path, std::string_view name, const CrawlPlace& around,
+                         bool inMaildir) const {
+    return rules_.placeInside(volume_.absolute(path), name, around, inMaildir);
+  }
 
   // Empty names, in memory that is used again and again.
   CrawlNames& scratchNames();
