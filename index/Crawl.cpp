@@ -152,7 +152,8 @@ class Crawl {
       if (const auto large = crawlLargeFolder(child, frame); !large) return large;
     } else {
       writeBatch(task.batch, child.id, frame);
-      finishFolder(child, task, first, StoreFolderState::sorted);
+      const auto finished = finishFolder(child, task, first, StoreFolderState::sorted);
+      if (!finished) return finished;
       takeInside(task, frame);
     }
     path_ = task.path;
@@ -184,8 +185,7 @@ class Crawl {
         if (const auto written = writeLargeFolder(opened, child.id, frame); !written) return written;
       }
       if (names->error || names->isAtEnd) {
-        finishFolder(child, *names, first, state);
-        return {};
+        return finishFolder(child, *names, first, state);
       }
       state = StoreFolderState::unsorted;
     }
@@ -212,14 +212,18 @@ class Crawl {
     return {};
   }
 
-  void finishFolder(const Child& child, const CrawlTask& task, std::int64_t first, StoreFolderState state) {
+  // Fails when it is this process that lacks something: then a folder is not unreadable, but the crawl is.
+  Result<void> finishFolder(const Child& child, const CrawlTask& task, std::int64_t first,
+                            StoreFolderState state) {
     if (task.error) {
       const int code = task.error->code;
+      if (code == EMFILE || code == ENFILE || code == ENOMEM) return *task.error;
       const bool hasVanished = code == ENOENT || code == ENOTDIR || code == ELOOP;
       state = code == EXDEV ? StoreFolderState::border : StoreFolderState::unreadable;
       if (!hasVanished && code != EXDEV) figures_.problems.add(volume_.absolute(child.task->path), code);
     }
     store_.addFolder(child.id, first, store_.nextId() - first, state);
+    return {};
   }
 
   // Writes the items of a batch, and notes the subfolders among them in the frame.

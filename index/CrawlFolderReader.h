@@ -87,6 +87,7 @@ class CrawlFolderReader {
   void readItem(const CrawlFolder& folder, std::string_view name, const char* nameEnd, CrawlBatch& batch);
   OwnAttributes readAttributes(const CrawlFolder& folder, const char* name, bool isFolder, std::uint32_t item,
                                CrawlBatch& batch);
+  ssize_t listAttributes(const char* path);
   std::string_view readValue(const CrawlFolder& folder, const char* name, const char* attribute,
                              CrawlBatch& batch);
   bool carriesCacheTag(const CrawlFolder& folder) const;
@@ -96,6 +97,7 @@ class CrawlFolderReader {
   const CrawlRules& rules_;
   bool hasOwnCurrentFolder_;
   bool isCurrent_ = false;  // of the folder whose items are being read
+  bool expectsAttributes_ = false;
   CrawlNames scratchNames_;
   std::string attributePath_;
   std::vector<char> entries_, attributeNames_, attributeValue_;
