@@ -14,12 +14,15 @@
 namespace norvex {
 namespace {
 
-// How far a folder's subfolders are known ahead, and how many folders on the way down are looked at for such.
-constexpr std::size_t kKnownAhead = 16;
+// How far a folder's subfolders are known ahead, how many folders on the way down are looked at for such.
+constexpr std::size_t kKnownAhead = CrawlFolderTask::kMostInside;
 constexpr std::size_t kFoldersLookedAhead = 64;
 constexpr std::size_t kFewWaiting = 32;  // below this more is given, so that no helper is ever idle
 constexpr std::size_t kMostWaiting = 128;
+// What has been read ahead takes at most this; the last part of it is kept for what comes next.
 constexpr std::size_t kMostHeldBytes = 8 * 1024 * 1024;
+constexpr std::size_t kMostHeldBytesOfOthers = 4 * 1024 * 1024;
+constexpr std::size_t kNextFolders = 2;
 
 // A subfolder whose turn comes.
 struct Child {
@@ -33,6 +36,7 @@ struct Child {
 struct Frame {
   std::size_t pathLength = 0;
   CrawlPlace place;
+  KeptFolder kept;  // while there are few such
   MaildirSigns maildir;
   std::deque<Child> next;
   std::size_t given = 0;      // how many of these are being read ahead
@@ -66,7 +70,7 @@ class Crawl {
  private:
   Result<void> crawlRoot() {
     CrawlFolderReader reader(volume_, rules_);
-    auto root = reader.enter("", CrawlPlace{});
+    auto root = reader.enter("", CrawlPlace{}, nullptr);
     if (!root) return root.error();
     CrawlBatch batch;
     const CrawledItem item = reader.readRoot(root.value(), batch);
@@ -76,7 +80,7 @@ class Crawl {
     Child child{kRootItem, {}, item.type, nullptr};
     const std::string name = volume_.root().substr(volume_.root().rfind('/') + 1);
     const CrawlPlace place = rules_.placeInside(volume_.root(), name, CrawlPlace{}, false);
-    child.task = std::make_shared<CrawlFolderTask>(std::string(), place, item.type);
+    child.task = std::make_shared<CrawlFolderTask>(std::string(), place, item.type, nullptr);
     workers_.give({child.task});
     return crawlFolder(std::move(child));
   }
@@ -112,10 +116,12 @@ class Crawl {
   void readAhead() {
     const Frame& deepest = frames_.back();
     if (deepest.given > 0 && workers_.waiting() > kFewWaiting) return;
-    const bool hasMemory = workers_.heldBytes() < kMostHeldBytes;
-    const std::size_t most = hasMemory ? kMostWaiting - std::min(kMostWaiting, workers_.waiting()) : 0;
+    const std::size_t held = workers_.heldBytes();
+    const std::size_t most =
+        held < kMostHeldBytes ? kMostWaiting - std::min(kMostWaiting, workers_.waiting()) : 0;
     std::vector<std::shared_ptr<CrawlTask>> tasks;
-    const std::size_t depth = std::min(kFoldersLookedAhead, frames_.size());
+    const std::size_t looked = held < kMostHeldBytesOfOthers ? kFoldersLookedAhead : kNextFolders;
+    const std::size_t depth = std::min(looked, frames_.size());
     for (std::size_t up = 0; up < depth; ++up) {
       Frame& frame = frames_[frames_.size() - 1 - up];
       while (frame.given < frame.next.size()) {
@@ -133,7 +139,7 @@ class Crawl {
     path += child.name;
     const CrawlPlace place =
         rules_.placeInside(volume_.absolute(path), child.name, frame.place, frame.maildir.isMaildir());
-    child.task = std::make_shared<CrawlFolderTask>(std::move(path), place, child.type);
+    child.task = std::make_shared<CrawlFolderTask>(std::move(path), place, child.type, frame.kept);
     return child.task;
   }
 
@@ -141,17 +147,27 @@ class Crawl {
     CrawlFolderTask& task = *child.task;
     if (!workers_.finish(task, cancelled_)) return systemError(ECANCELED);
     const std::int64_t first = store_.nextId();
-    Frame frame{task.path.size(), task.place, {}, {}, 0, 0, 0};
+    Frame frame{task.path.size(), task.place, std::move(task.kept), {}, {}, 0, 0, 0};
     if (task.isLarge) {
       if (const auto large = crawlLargeFolder(child, frame); !large) return large;
     } else {
       writeBatch(task.batch, child.id, frame);
-      finishFolder(child, task, first, StoreFolderState::sorted);
+      const auto finished = finishFolder(child, task, first, StoreFolderState::sorted);
+      if (!finished) return finished;
+      takeInside(task, frame);
     }
     path_ = task.path;
     if (!frame.next.empty()) frames_.push_back(std::move(frame));
     if (progress_) progress_(figures_);
     return store_.status();
+  }
+
+  // The folders that were read with the one around them are the first of those in it.
+  static void takeInside(CrawlFolderTask& task, Frame& frame) {
+    frame.given = std::min(task.inside.size(), frame.next.size());
+    for (std::size_t index = 0; index < frame.given; ++index)
+      frame.next[index].task = std::move(task.inside[index]);
+    task.inside.clear();
   }
 
   // Its names are read as many at a time as memory is kept for, and its items by all workers at once.
@@ -169,8 +185,7 @@ class Crawl {
         if (const auto written = writeLargeFolder(opened, child.id, frame); !written) return written;
       }
       if (names->error || names->isAtEnd) {
-        finishFolder(child, *names, first, state);
-        return {};
+        return finishFolder(child, *names, first, state);
       }
       state = StoreFolderState::unsorted;
     }
@@ -197,14 +212,18 @@ class Crawl {
     return {};
   }
 
-  void finishFolder(const Child& child, const CrawlTask& task, std::int64_t first, StoreFolderState state) {
+  // Fails when it is this process that lacks something: then a folder is not unreadable, but the crawl is.
+  Result<void> finishFolder(const Child& child, const CrawlTask& task, std::int64_t first,
+                            StoreFolderState state) {
     if (task.error) {
       const int code = task.error->code;
+      if (code == EMFILE || code == ENFILE || code == ENOMEM) return *task.error;
       const bool hasVanished = code == ENOENT || code == ENOTDIR || code == ELOOP;
       state = code == EXDEV ? StoreFolderState::border : StoreFolderState::unreadable;
       if (!hasVanished && code != EXDEV) figures_.problems.add(volume_.absolute(child.task->path), code);
     }
     store_.addFolder(child.id, first, store_.nextId() - first, state);
+    return {};
   }
 
   // Writes the items of a batch, and notes the subfolders among them in the frame.

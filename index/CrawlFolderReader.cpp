@@ -96,8 +96,9 @@ CrawlFolderReader::CrawlFolderReader(const CrawlVolume& volume, const CrawlRules
       attributeNames_(kLongestAttribute),
       attributeValue_(kLongestAttribute) {}
 
-Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const CrawlPlace& place) {
-  auto fd = volume_.openFolder(path);
+Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const CrawlPlace& place,
+                                             const KeptFolder& around) {
+  auto fd = volume_.openFolder(path, around);
   if (!fd) return fd.error();
   if (volume_.mayHaveSnapshots() && !path.empty() && isReadOnlySnapshot(fd.value().get()))
     return systemError(EXDEV);
@@ -198,15 +199,27 @@ void CrawlFolderReader::readItem(const CrawlFolder& folder, std::string_view nam
   batch.items.push_back(item);
 }
 
+// To ask whether there are any is cheaper than to have them listed, and mostly the answer is no. Where it was
+// yes - on some systems every file has one - the next ones are listed at once.
+ssize_t CrawlFolderReader::listAttributes(const char* path) {
+  if (!expectsAttributes_) {
+    const ssize_t size = ::llistxattr(path, nullptr, 0);
+    if (size <= 0) return size;
+  }
+  // The kernel allocates what it is told that there is room for, so the usual case asks for little.
+  ssize_t size = ::llistxattr(path, attributeNames_.data(), kUsualAttributes);
+  if (size < 0 && errno == ERANGE) size = ::llistxattr(path, attributeNames_.data(), attributeNames_.size());
+  expectsAttributes_ = size > 0;
+  return size;
+}
+
 CrawlFolderReader::OwnAttributes CrawlFolderReader::readAttributes(const CrawlFolder& folder,
                                                                    const char* name, bool isFolder,
                                                                    std::uint32_t item, CrawlBatch& batch) {
   OwnAttributes own;
   if (!volume_.hasAttributes()) return own;
   const char* path = attributePath(folder, name);
-  // The kernel allocates what it is told that there is room for, so the usual case asks for little.
-  ssize_t size = ::llistxattr(path, attributeNames_.data(), kUsualAttributes);
-  if (size < 0 && errno == ERANGE) size = ::llistxattr(path, attributeNames_.data(), attributeNames_.size());
+  const ssize_t size = listAttributes(path);
   if (size < 0 && errno == ENOTSUP) volume_.noteNoAttributes();
   for (ssize_t offset = 0; offset < size;) {
     const char* attribute = attributeNames_.data() + offset;

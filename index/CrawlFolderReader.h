@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "index/CrawlBatch.h"
@@ -49,7 +50,16 @@ class CrawlFolderReader {
   CrawlFolderReader(const CrawlVolume& volume, const CrawlRules& rules);
 
   // errno on failure; EXDEV for a folder in which another volume, or a read-only snapshot, begins.
-  Result<CrawlFolder> enter(const std::string& path, const CrawlPlace& place);
+  Result<CrawlFolder> enter(const std::string& path, const CrawlPlace& place, const KeptFolder& around);
+
+  // Keeps a folder open for those in it, unless too many are.
+  KeptFolder keep(CrawlFolder folder) const { return volume_.keep(std::move(folder.fd)); }
+
+  // What the folder at `path` below the root passes on to its items.
+  CrawlPlace placeInside(std::string_view path, std::string_view name, const CrawlPlace& around,
+                         bool inMaildir) const {
+    return rules_.placeInside(volume_.absolute(path), name, around, inMaildir);
+  }
 
   // Empty names, in memory that is used again and again.
   CrawlNames& scratchNames();
@@ -77,6 +87,7 @@ class CrawlFolderReader {
   void readItem(const CrawlFolder& folder, std::string_view name, const char* nameEnd, CrawlBatch& batch);
   OwnAttributes readAttributes(const CrawlFolder& folder, const char* name, bool isFolder, std::uint32_t item,
                                CrawlBatch& batch);
+  ssize_t listAttributes(const char* path);
   std::string_view readValue(const CrawlFolder& folder, const char* name, const char* attribute,
                              CrawlBatch& batch);
   bool carriesCacheTag(const CrawlFolder& folder) const;
@@ -86,6 +97,7 @@ class CrawlFolderReader {
   const CrawlRules& rules_;
   bool hasOwnCurrentFolder_;
   bool isCurrent_ = false;  // of the folder whose items are being read
+  bool expectsAttributes_ = false;
   CrawlNames scratchNames_;
   std::string attributePath_;
   std::vector<char> entries_, attributeNames_, attributeValue_;

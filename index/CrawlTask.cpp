@@ -1,11 +1,29 @@
 #include "index/CrawlTask.h"
 
+#include <algorithm>
 #include <utility>
 
+#include "index/FolderRules.h"
+
 namespace norvex {
+namespace {
+
+// What one task may hand over. Also bounds how deep it goes: every folder takes some.
+constexpr std::size_t kMostBytes = 32 * 1024;
+
+bool isFolder(const CrawledItem& item) {
+  return item.kind == CrawlItemKind::folder;
+}
+
+}  // namespace
 
 void CrawlFolderTask::run(CrawlFolderReader& reader) {
-  auto folder = reader.enter(path, place);
+  std::size_t bytesLeft = kMostBytes;
+  read(reader, bytesLeft);
+}
+
+void CrawlFolderTask::read(CrawlFolderReader& reader, std::size_t& bytesLeft) {
+  auto folder = reader.enter(path, place, around);
   if (!folder) {
     error = folder.error();
     return;
@@ -19,11 +37,41 @@ void CrawlFolderTask::run(CrawlFolderReader& reader) {
   if (!listed) error = listed.error();
   reader.readItems(folder.value(), names, 0, names.size(), batch);
   reader.readFolderItself(folder.value(), names, type, batch);
+  bytesLeft -= std::min(bytesLeft, batch.bytes() + sizeof *this);
+  const bool hasFolders = std::any_of(batch.items.begin(), batch.items.end(), isFolder);
+  if (!hasFolders) return;
+  kept = reader.keep(std::move(folder).value());
+  readInside(reader, bytesLeft);
+}
+
+void CrawlFolderTask::readInside(CrawlFolderReader& reader, std::size_t& bytesLeft) {
+  MaildirSigns maildir;
+  for (const CrawledItem& item : batch.items) {
+    if (item.kind == CrawlItemKind::folder || item.kind == CrawlItemKind::border)
+      maildir.seeFolder(batch.nameOf(item));
+  }
+  for (const CrawledItem& item : batch.items) {
+    if (!isFolder(item)) continue;
+    if (bytesLeft == 0 || inside.size() == kMostInside) return;
+    const std::string_view name = batch.nameOf(item);
+    std::string itsPath = path.empty() ? std::string(name) : path + "/" + std::string(name);
+    const CrawlPlace itsPlace = reader.placeInside(itsPath, name, place, maildir.isMaildir());
+    inside.push_back(std::make_shared<CrawlFolderTask>(std::move(itsPath), itsPlace, item.type, kept));
+    inside.back()->read(reader, bytesLeft);
+    inside.back()->setDone();
+  }
+  kept.reset();
+}
+
+std::size_t CrawlFolderTask::bytes() const {
+  std::size_t sum = batch.bytes();
+  for (const auto& task : inside) sum += task->bytes();
+  return sum;
 }
 
 void CrawlNamesTask::run(CrawlFolderReader& reader) {
   if (opened == nullptr) {
-    auto folder = reader.enter(folder_.path, folder_.place);
+    auto folder = reader.enter(folder_.path, folder_.place, folder_.around);
     if (!folder) {
       error = folder.error();
       return;

@@ -9,6 +9,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "index/CrawlBatch.h"
 #include "index/CrawlFolderReader.h"
@@ -21,8 +22,14 @@ class CrawlTask {
   virtual ~CrawlTask() = default;
   virtual void run(CrawlFolderReader& reader) = 0;
 
+  // About the memory that its results take, in bytes.
+  virtual std::size_t bytes() const { return batch.bytes(); }
+
   CrawlBatch batch;
   std::optional<Error> error;  // the folder could not be opened, or not be read to its end
+
+ protected:
+  void setDone() { isDone_.store(true); }
 
  private:
   friend class CrawlWorkers;
@@ -35,20 +42,32 @@ struct CrawlOpenFolder {
   CrawlNames names;
 };
 
-// Reads a folder as a whole. One that takes more than `mostNameBytes` is only opened: its names are left to
-// CrawlNamesTask, because its turn may be far away and memory is not to fill with what waits.
+// Reads a folder as a whole, and then folders in it, depth first, as long as their items take little memory:
+// most folders are small, and to be handed over one by one would cost more than to be read. A folder that
+// takes more than `kMostNameBytes` is only opened: its names are left to CrawlNamesTask, because its turn may
+// be far away and memory is not to fill with what waits.
 class CrawlFolderTask final : public CrawlTask {
  public:
   static constexpr std::size_t kMostNameBytes = 32 * 1024;
+  static constexpr std::size_t kMostInside = 64;
 
-  CrawlFolderTask(std::string folderPath, const CrawlPlace& folderPlace, TypeId folderType)
-      : path(std::move(folderPath)), place(folderPlace), type(folderType) {}
+  CrawlFolderTask(std::string folderPath, const CrawlPlace& folderPlace, TypeId folderType,
+                  KeptFolder keptAround)
+      : path(std::move(folderPath)), place(folderPlace), type(folderType), around(std::move(keptAround)) {}
   void run(CrawlFolderReader& reader) override;
+  std::size_t bytes() const override;
 
   const std::string path;
   const CrawlPlace place;
   const TypeId type;
+  const KeptFolder around;  // the folder that it is in; may be empty
+  KeptFolder kept;          // the folder itself, when further folders in it are going to be read
   bool isLarge = false;
+  std::vector<std::shared_ptr<CrawlFolderTask>> inside;  // done: the first of the folders in it
+
+ private:
+  void read(CrawlFolderReader& reader, std::size_t& bytesLeft);
+  void readInside(CrawlFolderReader& reader, std::size_t& bytesLeft);
 };
 
 // Reads the next names of a large folder, as many as memory is kept for. The first run opens it.

@@ -19,6 +19,7 @@ namespace norvex {
 namespace {
 
 constexpr std::size_t kLongestPart = PATH_MAX - 1;
+constexpr int kMostKeptFolders = 200;  // far below the number of files that a process may have open
 constexpr unsigned kWanted = STATX_TYPE | STATX_INO | STATX_MNT_ID;
 
 // File systems whose attributes are elsewhere and may have changed there: these are asked anew.
@@ -131,12 +132,26 @@ Result<ScopedFd> CrawlVolume::openPart(int folder, const std::string& path, int 
   return fd;
 }
 
-Result<ScopedFd> CrawlVolume::openFolder(const std::string& path) const {
-  const std::string_view place = path.empty() ? std::string_view(".") : std::string_view(path);
+Result<ScopedFd> CrawlVolume::openFolder(const std::string& path, const KeptFolder& around) const {
+  std::string_view place = path.empty() ? std::string_view(".") : std::string_view(path);
+  if (around != nullptr) place.remove_prefix(place.rfind('/') + 1);
+  const int from = around != nullptr ? around->get() : fd_.get();
   // The folder's access time stays as it was where that is allowed: to its owner.
-  auto fd = openBelow(fd_.get(), place, O_RDONLY | O_DIRECTORY | O_NOATIME);
+  auto fd = openBelow(from, place, O_RDONLY | O_DIRECTORY | O_NOATIME);
   if (fd || fd.error().code != EPERM) return fd;
-  return openBelow(fd_.get(), place, O_RDONLY | O_DIRECTORY);
+  return openBelow(from, place, O_RDONLY | O_DIRECTORY);
+}
+
+KeptFolder CrawlVolume::keep(ScopedFd folder) const {
+  if (keptFolders_.fetch_add(1) >= kMostKeptFolders) {
+    keptFolders_.fetch_sub(1);
+    return nullptr;
+  }
+  const auto giveUp = [this](const ScopedFd* kept) {
+    const std::unique_ptr<const ScopedFd> owner(kept);
+    keptFolders_.fetch_sub(1);
+  };
+  return KeptFolder(std::make_unique<const ScopedFd>(std::move(folder)).release(), giveUp);
 }
 
 bool CrawlVolume::holdsFile(int folder, std::string_view path) const {

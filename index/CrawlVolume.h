@@ -5,6 +5,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <string_view>
 
@@ -17,6 +18,9 @@ namespace norvex {
 
 // Which file system is mounted at a path, as text that differs for different ones.
 Result<std::string> fileSystemIdAt(const std::string& path);
+
+// A folder that stays open because folders in it are going to be opened; empty for one that does not.
+using KeptFolder = std::shared_ptr<const ScopedFd>;
 
 class CrawlVolume {
  public:
@@ -33,7 +37,12 @@ class CrawlVolume {
 
   // Opens a folder below the root; an empty path is the root. No part of the path is followed when it is a
   // link or another volume. Any length. errno on failure: EXDEV for another volume.
-  Result<ScopedFd> openFolder(const std::string& path) const;
+  // `around`: the folder that it is in, where that has been kept, which saves the kernel the way from the
+  // root.
+  Result<ScopedFd> openFolder(const std::string& path, const KeptFolder& around = nullptr) const;
+
+  // Keeps a folder open, unless too many are.
+  KeptFolder keep(ScopedFd folder) const;
 
   // Whether there is a regular file at `path` below an open folder, no part of which is a link.
   bool holdsFile(int folder, std::string_view path) const;
@@ -68,6 +77,7 @@ class CrawlVolume {
   bool mayHaveSnapshots_ = false;
   bool hasOpenat2_ = true;
   mutable std::atomic<bool> hasAttributes_{true};
+  mutable std::atomic<int> keptFolders_{0};
 };
 
 }  // namespace norvex

@@ -66,8 +66,8 @@ void CrawlWorkers::runNext(CrawlFolderReader& reader, std::unique_lock<std::mute
   waitingCount_.store(waiting_.size(), std::memory_order_relaxed);
   lock.unlock();
   task->run(reader);
-  heldBytes_.fetch_add(task->batch.bytes(), std::memory_order_relaxed);
-  task->isDone_.store(true);
+  heldBytes_.fetch_add(task->bytes(), std::memory_order_relaxed);
+  task->setDone();
   const bool isWanted = wanted_.load() == task.get();
   lock.lock();
   if (isWanted) done_.notify_one();

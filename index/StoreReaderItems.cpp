@@ -239,12 +239,16 @@ Result<std::optional<MetadataValue>> StoreReader::attribute(std::int64_t id, std
     return Value(std::move(path).value());
   }
   if (name == "kMDItemFSName") return Value(isRoot ? lastComponent(root_) : item.name);
-  if (name == "kMDItemFSSize") return item.size ? Value(*item.size) : Value();
+  if (name == "kMDItemFSSize") {
+    if (!item.size) return Value();
+    return Value(*item.size);
+  }
   if (name == "kMDItemFSContentChangeDate") {
     return Value(MetadataDate{static_cast<double>(item.mtime) / kNanosecondsPerSecond});
   }
   if (isRoot && name == kMDStoreLastHealthCheck) {
-    return healthCheck_ ? Value(MetadataDate{static_cast<double>(*healthCheck_)}) : Value();
+    if (!healthCheck_) return Value();
+    return Value(MetadataDate{static_cast<double>(*healthCheck_)});
   }
   if (isRoot && name == kMDStoreAccumulatedSizes) {
     if (!healthCheck_) return Value();

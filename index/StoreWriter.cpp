@@ -22,6 +22,9 @@ constexpr const char* kWriterSettings =
     "PRAGMA page_size=8192; PRAGMA journal_mode=OFF; PRAGMA synchronous=OFF; PRAGMA locking_mode=EXCLUSIVE; "
     "PRAGMA cache_size=-4096";
 
+// An index is sorted in as much memory as the cache has: it is to fit into the processor's own.
+constexpr const char* kIndexSettings = "PRAGMA cache_size=-1024";
+
 // Programs may carry names without end; those that come back are found in the store then.
 constexpr std::size_t kMostRememberedNames = 1000;
 
@@ -264,6 +267,7 @@ Result<void> StoreWriter::writeFacts(const StoreVolumeFacts& facts) {
 }
 
 Result<void> StoreWriter::makeIndexes() {
+  if (const auto set = database_->run(kIndexSettings); !set) return set;
   for (const StoreSchemaObject& object : kStoreSchema) {
     if (object.kind != "index") continue;
     if (const auto made = database_->run(object.sql); !made) return made;
