@@ -30,7 +30,7 @@ struct ContentType {
 class ContentTypes {
  public:
   // Longer database files are cut after this many bytes. The usual one has 35 KB.
-  static constexpr std::size_t kMaximumDatabaseBytes = 4 * 1024 * 1024;
+  static constexpr std::size_t kMaximumDatabaseBytes = std::size_t{4} << 20U;
 
   // The folders that databases are looked for in, the one that comes first decides first. `dataHome` is the
   // user's data folder.

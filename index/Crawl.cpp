@@ -20,8 +20,8 @@ constexpr std::size_t kFoldersLookedAhead = 64;
 constexpr std::size_t kFewWaiting = 32;  // below this more is given, so that no helper is ever idle
 constexpr std::size_t kMostWaiting = 128;
 // What has been read ahead takes at most this; the last part of it is kept for what comes next.
-constexpr std::size_t kMostHeldBytes = 8 * 1024 * 1024;
-constexpr std::size_t kMostHeldBytesOfOthers = 4 * 1024 * 1024;
+constexpr std::size_t kMostHeldBytes = std::size_t{8} << 20U;
+constexpr std::size_t kMostHeldBytesOfOthers = std::size_t{4} << 20U;
 constexpr std::size_t kNextFolders = 2;
 
 // A subfolder whose turn comes.
@@ -88,7 +88,7 @@ class Crawl {
   // One step: crawls the next subfolder of the deepest folder, or leaves that.
   Result<void> advance() {
     if (frames_.back().next.empty()) {
-      if (const auto filled = refill(frames_.back()); !filled) return filled;
+      if (auto filled = refill(frames_.back()); !filled) return filled;
     }
     if (frames_.back().next.empty()) {
       frames_.pop_back();
@@ -143,16 +143,17 @@ class Crawl {
     return child.task;
   }
 
-  Result<void> crawlFolder(Child child) {
+  Result<void> crawlFolder(Child&& found) {
+    const Child child = std::move(found);  // what it was found in may move meanwhile
     CrawlFolderTask& task = *child.task;
     if (!workers_.finish(task, cancelled_)) return systemError(ECANCELED);
     const std::int64_t first = store_.nextId();
     Frame frame{task.path.size(), task.place, std::move(task.kept), {}, {}, 0, 0, 0};
     if (task.isLarge) {
-      if (const auto large = crawlLargeFolder(child, frame); !large) return large;
+      if (auto large = crawlLargeFolder(child, frame); !large) return large;
     } else {
       writeBatch(task.batch, child.id, frame);
-      const auto finished = finishFolder(child, task, first, StoreFolderState::sorted);
+      auto finished = finishFolder(child, task, first, StoreFolderState::sorted);
       if (!finished) return finished;
       takeInside(task, frame);
     }
@@ -182,7 +183,7 @@ class Crawl {
       writeAttributes(names->batch, child.id, 0);
       opened = names->opened;
       if (opened != nullptr) {
-        if (const auto written = writeLargeFolder(opened, child.id, frame); !written) return written;
+        if (auto written = writeLargeFolder(opened, child.id, frame); !written) return written;
       }
       if (names->error || names->isAtEnd) {
         return finishFolder(child, *names, first, state);
@@ -206,7 +207,7 @@ class Crawl {
       if (!workers_.finish(*tasks.front(), cancelled_)) return systemError(ECANCELED);
       writeBatch(tasks.front()->batch, id, frame);
       tasks.pop_front();
-      if (const auto status = store_.status(); !status) return status;
+      if (auto status = store_.status(); !status) return status;
       if (progress_) progress_(figures_);
     }
     return {};

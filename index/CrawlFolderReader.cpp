@@ -23,9 +23,10 @@
 namespace norvex {
 namespace {
 
-constexpr std::size_t kEntriesBytes = 64 * 1024;
+constexpr std::size_t kEntriesBytes = std::size_t{64} << 10U;
 constexpr std::size_t kUsualAttributes = 256;
-constexpr std::size_t kLongestAttribute = 64 * 1024;  // the kernel's limit of a list of names and of a value
+constexpr std::size_t kLongestAttribute = std::size_t{64}
+                                          << 10U;  // the kernel's limit of a list of names and of a value
 constexpr unsigned kWanted = STATX_TYPE | STATX_MODE | STATX_INO | STATX_SIZE | STATX_MTIME | STATX_MNT_ID;
 
 // What a rule gives to an item.

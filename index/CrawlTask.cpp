@@ -9,7 +9,7 @@ namespace norvex {
 namespace {
 
 // What one task may hand over. Also bounds how deep it goes: every folder takes some.
-constexpr std::size_t kMostBytes = 32 * 1024;
+constexpr std::size_t kMostBytes = std::size_t{32} << 10U;
 
 bool isFolder(const CrawledItem& item) {
   return item.kind == CrawlItemKind::folder;

@@ -48,7 +48,7 @@ struct CrawlOpenFolder {
 // be far away and memory is not to fill with what waits.
 class CrawlFolderTask final : public CrawlTask {
  public:
-  static constexpr std::size_t kMostNameBytes = 32 * 1024;
+  static constexpr std::size_t kMostNameBytes = std::size_t{32} << 10U;
   static constexpr std::size_t kMostInside = 64;
 
   CrawlFolderTask(std::string folderPath, const CrawlPlace& folderPlace, TypeId folderType,
@@ -73,7 +73,7 @@ class CrawlFolderTask final : public CrawlTask {
 // Reads the next names of a large folder, as many as memory is kept for. The first run opens it.
 class CrawlNamesTask final : public CrawlTask {
  public:
-  static constexpr std::size_t kMostNameBytes = 16 * 1024 * 1024;
+  static constexpr std::size_t kMostNameBytes = std::size_t{16} << 20U;
 
   CrawlNamesTask(const CrawlFolderTask& folder, std::shared_ptr<CrawlOpenFolder> before)
       : opened(std::move(before)), folder_(folder) {}

@@ -63,7 +63,7 @@ class IndexUpdate {
     const TypeId type = rules_.types().ofFolder(root_.substr(root_.rfind('/') + 1), false);
     store.value().add({0, {}, type, std::nullopt, 0});
     store.value().addType(type, rules_.types().type(type));
-    if (const auto finished = store.value().finishEmpty(facts_); !finished) return finished;
+    if (auto finished = store.value().finishEmpty(facts_); !finished) return finished;
     return folder_.publish(root_);
   }
 

@@ -95,13 +95,13 @@ std::string StoreFolder::lockPath(std::string_view volumeRoot) const {
 }
 
 Result<void> StoreFolder::prepare() const {
-  if (const auto made = makeFolders(path()); !made) return made;
+  if (auto made = makeFolders(path()); !made) return made;
   return writeCacheTag(cacheFolder_ + "/CACHEDIR.TAG");
 }
 
 Result<void> StoreFolder::publish(std::string_view volumeRoot) const {
   const std::string unfinished = unfinishedPath(volumeRoot);
-  if (const auto synced = syncPath(unfinished, O_RDONLY); !synced) return synced;
+  if (auto synced = syncPath(unfinished, O_RDONLY); !synced) return synced;
   if (::rename(unfinished.c_str(), storePath(volumeRoot).c_str()) != 0) return systemError(errno);
   return syncPath(path(), O_RDONLY | O_DIRECTORY);
 }

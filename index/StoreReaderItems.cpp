@@ -9,7 +9,7 @@
 namespace norvex {
 namespace {
 
-constexpr std::size_t kLongestPath = 4 * 1024 * 1024;
+constexpr std::size_t kLongestPath = std::size_t{4} << 20U;
 constexpr double kNanosecondsPerSecond = 1e9;
 
 bool isName(std::string_view name) {
@@ -133,7 +133,8 @@ Result<std::string> StoreReader::climb(std::int64_t folder) {
   }
   std::string path = folder == kRootItem ? root_ : lastFolderPath_;
   if (path.size() + length > kLongestPath) return damagedStore("an item is too deep");
-  for (auto name = names.rbegin(); name != names.rend(); ++name) appendName(path, *name);
+  std::reverse(names.begin(), names.end());
+  for (const std::string& name : names) appendName(path, name);
   return path;
 }
 

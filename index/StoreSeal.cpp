@@ -16,7 +16,8 @@ namespace norvex {
 namespace {
 
 constexpr std::uint64_t kMagic = 0x314C414553585653;  // "SVXSEAL1"
-constexpr std::size_t kReadBytes = 256 * 1024;        // stays in the second-level cache between read and sum
+constexpr std::size_t kReadBytes = std::size_t{256}
+                                   << 10U;  // stays in the second-level cache between read and sum
 
 // Four independent lanes of multiply and rotate: as fast as memory is read. Each step is a bijection of its
 // lane, so a change of any one word always changes the sum.

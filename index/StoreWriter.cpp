@@ -112,11 +112,11 @@ Result<StoreWriter> StoreWriter::create(const std::string& path, const std::atom
 Result<void> StoreWriter::begin() {
   const std::string version = "PRAGMA user_version=" + std::to_string(kStoreSchemaVersion);
   for (const char* sql : {kWriterSettings, version.c_str(), "BEGIN"}) {
-    if (const auto run = database_->run(sql); !run) return run;
+    if (auto run = database_->run(sql); !run) return run;
   }
   for (const StoreSchemaObject& object : kStoreSchema) {
     if (object.kind != "table") continue;
-    if (const auto made = database_->run(object.sql); !made) return made;
+    if (auto made = database_->run(object.sql); !made) return made;
   }
   const std::pair<StoreStatement*, const char*> statements[] = {
       {&insertItem_, "INSERT INTO items VALUES(?,?,?,?,?,?)"},
@@ -267,10 +267,10 @@ Result<void> StoreWriter::writeFacts(const StoreVolumeFacts& facts) {
 }
 
 Result<void> StoreWriter::makeIndexes() {
-  if (const auto set = database_->run(kIndexSettings); !set) return set;
+  if (auto set = database_->run(kIndexSettings); !set) return set;
   for (const StoreSchemaObject& object : kStoreSchema) {
     if (object.kind != "index") continue;
-    if (const auto made = database_->run(object.sql); !made) return made;
+    if (auto made = database_->run(object.sql); !made) return made;
   }
   return {};
 }
@@ -311,19 +311,19 @@ Result<void> StoreWriter::closeAndSeal() {
 }
 
 Result<void> StoreWriter::finish(const StoreVolumeFacts& facts, std::int64_t healthCheckTime) {
-  if (const auto written = writeFacts(facts); !written) return written;
-  if (const auto committed = database_->run("COMMIT"); !committed) return committed;
-  if (const auto made = makeCheckedIndexes(); !made) return made;
-  if (const auto checked = checkCounts(facts.files + facts.folders + 1); !checked) return checked;
+  if (auto written = writeFacts(facts); !written) return written;
+  if (auto committed = database_->run("COMMIT"); !committed) return committed;
+  if (auto made = makeCheckedIndexes(); !made) return made;
+  if (auto checked = checkCounts(facts.files + facts.folders + 1); !checked) return checked;
   setFact(kFactHealthCheck, healthCheckTime);
   if (failure_) return *failure_;
   return closeAndSeal();
 }
 
 Result<void> StoreWriter::finishEmpty(const StoreVolumeFacts& facts) {
-  if (const auto written = writeFacts(facts); !written) return written;
-  if (const auto made = makeIndexes(); !made) return made;
-  if (const auto committed = database_->run("COMMIT"); !committed) return committed;
+  if (auto written = writeFacts(facts); !written) return written;
+  if (auto made = makeIndexes(); !made) return made;
+  if (auto committed = database_->run("COMMIT"); !committed) return committed;
   return closeAndSeal();
 }
 

@@ -31,6 +31,7 @@ std::vector<std::string> positionLines(const std::vector<std::int64_t>& sizes) {
 
 std::vector<std::string> safeLines(const std::vector<std::string>& texts) {
   std::vector<std::string> lines;
+  lines.reserve(texts.size());
   for (const std::string& text : texts) lines.push_back(safeText(text));
   return lines;
 }

@@ -3,6 +3,8 @@
 
 #include <chrono>
 #include <clocale>
+#include <cstdio>
+#include <exception>
 #include <filesystem>
 #include <iostream>
 #include <string>
@@ -64,7 +66,12 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
 }  // namespace
 
 int main(int argc, char* argv[]) {
-  std::setlocale(LC_CTYPE, "");
-  std::ios::sync_with_stdio(false);
-  return static_cast<int>(run(argc, argv));
+  try {
+    std::setlocale(LC_CTYPE, "");
+    std::ios::sync_with_stdio(false);
+    return static_cast<int>(run(argc, argv));
+  } catch (const std::exception& error) {  // of the libraries: out of memory, above all
+    std::fprintf(stderr, "norvexctl: %s\n", error.what());
+    return static_cast<int>(norvex::ExitStatus::failed);
+  }
 }
