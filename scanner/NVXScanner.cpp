@@ -101,7 +101,7 @@ constexpr std::array<std::string_view, 4> photoLibraries = {
 struct MediaPlaces {
   std::vector<std::string> photoLibraries;
   std::string mobileDocuments;
-  std::string library;
+  std::string libraryFolder;
   std::string home;
   std::string mediaFolder;
   bool volumeHoldsPhotoLibrary = false;
@@ -111,7 +111,7 @@ struct MediaPlaces {
 void preparePhotoLibraries(MediaPlaces& places, const std::string& volume) {
   for (const std::string_view library : photoLibraries) places.photoLibraries.push_back(inHome(library));
   places.mobileDocuments = inHome("~/Library/Mobile Documents");
-  places.library = inHome("~/Library");
+  places.libraryFolder = inHome("~/Library");
   places.home = inHome("~");
   places.volumeHoldsPhotoLibrary = std::any_of(
       places.photoLibraries.begin(), places.photoLibraries.end(), [&](const std::string& library) {
@@ -145,7 +145,7 @@ enum class Place : std::size_t { mobileDocuments, library, home, usersShared, ot
 
 Place placeOf(const MediaPlaces& places, const std::string& path) {
   if (path.starts_with(places.mobileDocuments)) return Place::mobileDocuments;
-  if (path.starts_with(places.library)) return Place::library;
+  if (path.starts_with(places.libraryFolder)) return Place::library;
   if (path.starts_with(places.home)) return Place::home;
   if (path.starts_with("/Users/Shared")) return Place::usersShared;
   return Place::other;

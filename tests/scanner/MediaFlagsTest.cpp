@@ -18,7 +18,7 @@ TEST(PhotoLibraryFlag, NeedsALibraryThatExistsAndWhosePathBeginsWithTheVolumes) 
   const struct {
     const char* claim;
     const char* volume;
-    TreeItem library;
+    TreeItem photoLibrary;
     bool isSet;
   } rows[] = {
       {"the startup volume holds every library", "/", folder("Picara Library"), true},
@@ -35,7 +35,7 @@ TEST(PhotoLibraryFlag, NeedsALibraryThatExistsAndWhosePathBeginsWithTheVolumes) 
   };
   for (const auto& row : rows) {
     ScanWorld world({row.volume});
-    world.files.put("/Users/user/Pictures", row.library);
+    world.files.put("/Users/user/Pictures", row.photoLibrary);
     world.holds(row.volume, images, "/Users/user/Desktop/Picara Library.jpg", 7);
     world.holds(row.volume, movies, "/Users/user/Desktop/Picara Library.mov", 5);
     EXPECT_EQ(scanned(world, {"imagesIn", "moviesIn"}),
