@@ -100,7 +100,7 @@ bool StoredQuery::start() {
 
 // False when the scope's store cannot be searched. A volume without a store is searched in vain.
 bool StoredQuery::addScope(const Location& scope, const PredicateSql& sql) {
-  const auto store = gathering_->stores.storeOf(scope.path());
+  const auto store = gathering_->stores.storeOf(normalizedPath(scope.path()));
   if (!store.ok()) return store.error().code == kStoreMissing;
   auto rows = store.value()->prepare("SELECT i.id FROM items AS i WHERE " + sql.where + " ORDER BY i.id");
   if (!rows.ok() || !bindPredicateValues(rows.value().get(), sql).ok()) return false;

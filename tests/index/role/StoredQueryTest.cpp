@@ -97,6 +97,22 @@ TEST(StoredQuery, EachOfTheScansPredicatesFindsItsItems) {
   for (const auto& [predicate, expected] : rows) EXPECT_EQ(queried.search(predicate), expected) << predicate;
 }
 
+TEST(StoredQuery, AScopeIsTheSameVolumeHoweverItsPathIsWritten) {
+  QueriedVolume queried;
+  queried.volume.file("a.png");
+  ASSERT_TRUE(queried.volume.update().ok());
+  for (const char* ending : {"", "/", "/.", "//"}) {
+    const auto query = makeStoredQuery(queried.stores, queried.world.eventLoops);
+    query->setPredicate("kMDItemFSName == 'a.png'");
+    query->setSearchScopes({Location::folder(queried.volume.root() + ending)});
+    const auto token = query->addFinishObserver([](MetadataQuery& finished) { finished.stop(); });
+    ASSERT_TRUE(query->start());
+    turnUntilStopped(queried.world, *query);
+    query->removeFinishObserver(token);
+    EXPECT_EQ(query->resultCount(), 1U) << ending;
+  }
+}
+
 TEST(StoredQuery, GathersMoreThanABatch) {
   QueriedVolume queried;
   constexpr std::size_t kFiles = 10'000;

@@ -2,6 +2,8 @@
 
 #include <grp.h>
 #include <gtest/gtest.h>
+#include <sched.h>
+#include <sys/mount.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -41,6 +43,20 @@ void asOrdinaryUser(const std::function<void()>& body) {
     becomeOrdinary();
     if (!testing::Test::HasFatalFailure()) body();
   });
+}
+
+bool enterOwnMounts() {
+  const bool entered = ::unshare(CLONE_NEWNS) == 0 || ::unshare(CLONE_NEWUSER | CLONE_NEWNS) == 0;
+  return entered && ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0;
+}
+
+bool canMount(const char* type) {
+  const pid_t child = ::fork();
+  if (child == 0) {
+    _exit(enterOwnMounts() && ::mount("none", "/tmp", type, 0, nullptr) == 0 ? 0 : 1);
+  }
+  int status = 1;
+  return child > 0 && ::waitpid(child, &status, 0) == child && status == 0;
 }
 
 }  // namespace norvex

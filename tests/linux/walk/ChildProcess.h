@@ -12,4 +12,10 @@ void inChildProcess(const std::function<void()>& body);
 // The same, as a user for whom permissions hold: root becomes "nobody", everybody else stays.
 void asOrdinaryUser(const std::function<void()>& body);
 
+// Gives the process its own view of what is mounted, in which it may mount. For a child process.
+bool enterOwnMounts();
+
+// Whether a child process can mount a file system of this type. Leaves this process as it is.
+bool canMount(const char* type);
+
 }  // namespace norvex
