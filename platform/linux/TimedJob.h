@@ -19,9 +19,9 @@ class TimedJob {
 
   std::string service() const { return label_ + ".service"; }
 
-  // Every unit that starts the service or, being masked, would: whatever the manager says that triggers it,
-  // and the masked ones among the job's own timers. In the order of their names. ENOENT when there is no such
-  // service.
+  // Every unit that starts the service or would, were it started or not masked: the job's own timers and
+  // whatever else the manager says that triggers it. In the order of their names. ENOENT when there is no
+  // such service or nothing that starts it.
   Result<std::vector<std::string>> triggers();
 
   // True when a trigger is enabled. Failures as of triggers().
@@ -33,10 +33,12 @@ class TimedJob {
   // next log-in on.
   Result<void> disable();
 
-  // Takes masks away, enables the job's own timers that are then not enabled, and starts them.
+  // Takes masks away, enables the triggers that are then not enabled, and starts them.
   Result<void> enable();
 
  private:
+  Result<std::vector<std::string>> ownTimers();
+
   UserManager& manager_;
   std::string label_;
 };

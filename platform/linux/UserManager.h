@@ -29,7 +29,8 @@ struct UnitStatus {
   std::string subState;     // of a timer "waiting" while it is started; of a service "running", "dead", ...
 };
 
-// The latest run of a service, as long as the manager remembers it: not beyond a log-out.
+// The latest run of a service, as long as the manager remembers it: not beyond a log-out, and when it
+// succeeded not after its timer was stopped. What is forgotten has not been.
 struct ServiceRun {
   using Moment = std::chrono::system_clock::time_point;
   std::optional<Moment> started;  // absent when it has not run
@@ -63,9 +64,12 @@ class UserManager {
   // A unit that there is no file of is no failure: its loadState is "not-found".
   Result<UnitStatus> status(const std::string& unit);
 
-  // The units that start this one, in the order of their names. The manager knows of those that it has
-  // loaded; status() loads one.
+  // The units that start this one, in the order of their names: those that the manager keeps in memory,
+  // because they are started or something needs them. A timer that is merely installed is not among them.
   Result<std::vector<std::string>> triggersOf(const std::string& service);
+
+  // The unit that this timer starts, whether the timer is started or not.
+  Result<std::string> unitStartedBy(const std::string& timer);
 
   Result<ServiceRun> lastRun(const std::string& service);
   Result<TimerMoments> momentsOf(const std::string& timer);
