@@ -1,14 +1,5 @@
 # The Debian package, made by cpack; scripts/package calls it with the preset "package".
 
-# Debian wants its documents compressed as small as they get, and the same in every build.
-find_program(GZIP gzip REQUIRED)
-function(norvex_install_compressed source name destination)
-  set(compressed ${CMAKE_CURRENT_BINARY_DIR}/${name}.gz)
-  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${source})
-  execute_process(COMMAND ${GZIP} -9nc ${source} OUTPUT_FILE ${compressed} COMMAND_ERROR_IS_FATAL ANY)
-  install(FILES ${compressed} DESTINATION ${destination})
-endfunction()
-
 set(documents ${CMAKE_INSTALL_FULL_DATADIR}/doc/norvex)
 norvex_install_compressed(${CMAKE_CURRENT_SOURCE_DIR}/debian/changelog changelog ${documents})
 install(FILES debian/copyright DESTINATION ${documents})
