@@ -29,7 +29,7 @@ ALL_THREE = BOTH + ["com.brixo.norvex.directoryinfo.run4"]
 
 INTERNAL = "install -D -m 644 /dev/null /etc/norvex/internal-install"
 LARGE_HOME = "mount -t tmpfs -o nr_inodes=0,mode=700,uid=4242,gid=4242 tmpfs /home/tester"
-SLOW_TIMER = 'rm "/etc/systemd/user/$timer.d/test.conf"'
+SLOW_TIMER = 'rm "/etc/systemd/user/$timer.d/every-second.conf"'
 PRESSURE = "/run/pressure"
 
 # The package's: another one may be in a folder that the session's user cannot reach.
@@ -148,16 +148,28 @@ def force_reports_again_and_leaves_the_timer_on(s):
 # Nothing to report, and not wanted.
 
 
-@case("sed -i 's#^IncludedVolumes=.*#IncludedVolumes=/media/absent#' /etc/chronel/backup.conf")
+@case(SLOW_TIMER)
 def without_a_checked_index_it_is_tried_again(s):
+    lib.fill_folder(pathlib.Path(VOLUME, "Many"), 300_000)
+    interrupt_first_index_update()
+    stores = HOME / ".cache/norvex/index"
+    stores.chmod(0o500)  # so that the service cannot bring the index up to date either
+    s.try_every_second()
     s.wait_for_runs(2)
     assert s.exit_of_agent() == "exited 0 success"
     assert s.reports() == [] and s.last_version_run() is None
     s.assert_switched_on()
-    mine = HOME / ".config/chronel/backup.conf"
-    mine.parent.mkdir(parents=True)
-    mine.write_text(f"[Backup]\nIncludedVolumes={VOLUME}\n")
+    stores.chmod(0o700)
     s.journal.wait(lib.is_report, "the report", 2)
+
+
+def interrupt_first_index_update():
+    """Kills it when the store has been announced, and before it has been checked."""
+    store = HOME / f".cache/norvex/index/{VOLUME.replace('/', '%2F')}.sqlite"
+    update = subprocess.Popen(["norvexctl", "index", "update"])
+    lib.eventually(store.exists, "the store has been announced")
+    update.kill()
+    assert update.wait() == -signal.SIGKILL
 
 
 @case("mkdir -p $HOME/.config/environment.d; "
@@ -256,19 +268,21 @@ set -e
 stage=$1 timer=$2 service=com.brixo.NorvexAgent.service
 cp -a "$stage"/. /
 systemctl --quiet --global preset "$timer"
+mount -t tmpfs tmpfs /var/lib/systemd/catalog
 journalctl --update-catalog
 
 mkdir -p /media/volume
-mount -t tmpfs -o mode=755 tmpfs /media/volume
+mount -t tmpfs -o mode=755,uid=4242,gid=4242,nr_inodes=0 tmpfs /media/volume
 mkdir -p /media/volume/Music /media/volume/Pictures
 for item in Music/song.mp3 Pictures/lake.jpg Pictures/hill.png letter.pdf; do
     head -c 5000 /dev/zero >"/media/volume/$item"
 done
 sed -i 's#^IncludedVolumes=.*#IncludedVolumes=/media/volume#' /etc/chronel/backup.conf
 
-mkdir -p "/etc/systemd/user/$timer.d" "/etc/systemd/user/$service.d"
+mkdir -p "/etc/systemd/user/$timer.d" "/etc/systemd/user/$service.d" /run/session-test
 printf '[Timer]\nOnActiveSec=\nOnCalendar=\nOnCalendar=*-*-* *:*:*\nAccuracySec=50ms\nRandomizedDelaySec=0\n' \
-    >"/etc/systemd/user/$timer.d/test.conf"
+    >/run/session-test/every-second.conf
+ln -s /run/session-test/every-second.conf "/etc/systemd/user/$timer.d/"
 {
     echo '[Unit]'
     echo 'StartLimitIntervalSec=0'
