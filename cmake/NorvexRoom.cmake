@@ -85,3 +85,26 @@ function(norvex_session_test name)
     WORKING_DIRECTORY /)
   set_tests_properties(${name} PROPERTIES SKIP_RETURN_CODE 77 LABELS session)
 endfunction()
+
+# norvex_session_cases(PREFIX SCRIPT ARGUMENT...)
+#
+# Declares a test for each case that `SCRIPT --list` names ("Claim=case", one a line): SCRIPT case ARGUMENT... Each makes
+# a session of its own; where none can be made the test is skipped, and its output says why. PREFIX_TESTS is set to
+# their names.
+function(norvex_session_cases prefix script)
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${script})
+  execute_process(
+    COMMAND ${CMAKE_COMMAND} -E env NORVEX_TIMER=${NORVEX_TIMER} ${Python3_EXECUTABLE} -B ${script} --list
+    OUTPUT_VARIABLE cases OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
+  string(REPLACE "\n" ";" cases "${cases}")
+  set(tests "")
+  foreach(case IN LISTS cases)
+    string(REGEX MATCH "^(.*)=(.*)$" ignored "${case}")
+    set(test ${prefix}.${CMAKE_MATCH_1})
+    add_test(NAME ${test} COMMAND ${Python3_EXECUTABLE} -B ${script} ${CMAKE_MATCH_2} ${ARGN})
+    set_tests_properties(${test} PROPERTIES
+      SKIP_RETURN_CODE 77 LABELS session ENVIRONMENT NORVEX_TIMER=${NORVEX_TIMER})
+    list(APPEND tests ${test})
+  endforeach()
+  set(${prefix}_TESTS ${tests} PARENT_SCOPE)
+endfunction()

@@ -13,13 +13,12 @@ left out; both by drop-ins, as an administrator would do it. All else is as it i
 
 import os
 import pathlib
-import re
 import signal
 import subprocess
 import sys
 
 import session as lib
-from session import HOME, MESSAGES_FILE, PREFERENCES, SERVICE, TIMER, Session, systemctl
+from session import HOME, MESSAGES_FILE, PREFERENCES, SERVICE, TIMER, systemctl
 
 HERE = pathlib.Path(__file__).resolve().parent
 VOLUME = "/media/volume"
@@ -308,22 +307,11 @@ def run_in_session(name, stage, timer):
                        PYTHON, "/run/session-test/agent_session_test.py", "--inside", name])
 
 
-def claim_of(name):
-    return re.sub(r"(?:^|_)([a-z])", lambda m: m.group(1).upper(), name)
-
-
 def main():
     if sys.argv[1:] == ["--list"]:
-        print("\n".join(f"{claim_of(name)}={name}" for name in cases))
+        print("\n".join(f"{lib.claim_of(name)}={name}" for name in cases))
     elif sys.argv[1] == "--inside":
-        inside = Session()
-        try:
-            cases[sys.argv[2]][0](inside)
-        except BaseException:
-            print(inside.journal.tail(), file=sys.stderr)
-            raise
-        finally:
-            inside.journal.close()
+        lib.run_inside(cases[sys.argv[2]][0])
     else:
         run_in_session(*sys.argv[1:])
 

@@ -6,7 +6,9 @@ Everything that the session's programs do in their own time is waited for, with 
 import json
 import os
 import pathlib
+import re
 import subprocess
+import sys
 import threading
 import time
 
@@ -222,3 +224,20 @@ def fill_folder(folder, entries):
     for number in range(1, entries):
         os.link(first, f"{number:0250d}", src_dir_fd=descriptor, dst_dir_fd=descriptor)
     os.close(descriptor)
+
+
+def claim_of(name):
+    """a_claim_like_this as AClaimLikeThis"""
+    return re.sub(r"(?:^|_)([a-z])", lambda match: match.group(1).upper(), name)
+
+
+def run_inside(test):
+    """Runs a test of the session that this process is in; tells the end of the journal when it fails."""
+    session = Session()
+    try:
+        test(session)
+    except BaseException:
+        print(session.journal.tail(), file=sys.stderr)
+        raise
+    finally:
+        session.journal.close()
