@@ -2,10 +2,11 @@
 """The Debian package, installed, upgraded, removed and purged for real, in a throw-away session of root.
 
 usage: debian_package_test.py --list
-       debian_package_test.py CASE BUILD TIMER NEXT_AGENT
+       debian_package_test.py --make BUILD NEXT_AGENT FOLDER
+       debian_package_test.py CASE FOLDER
 
-BUILD is the build folder, from which cpack makes the package; NEXT_AGENT an agent of the next run version. A package of
-the next release is made from this one: with that agent, a timer of that name, and a higher version. Exit status 77: no
+The packages are made once, in FOLDER: this release's by cpack from the build folder BUILD, and the next release's out of
+it, with NEXT_AGENT, which has the next run version, with a timer of that name, and a higher version. Exit status 77: no
 session can be made here.
 """
 
@@ -16,7 +17,6 @@ import re
 import shutil
 import subprocess
 import sys
-import tempfile
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent.parent
 sys.path[:0] = ["/run/session-test", str(ROOT / "tests/system/session")]
@@ -179,16 +179,16 @@ cp @FILES@ /run/session-test
 
 
 def make_this_package(build, folder):
-    lib.run("cpack", "--config", f"{build}/CPackConfig.cmake", "-G", "DEB", "-B", str(folder))
-    made = list(folder.glob("*.deb"))
+    lib.run("cpack", "--config", f"{build}/CPackConfig.cmake", "-G", "DEB", "-B", str(folder / "cpack"))
+    made = list((folder / "cpack").glob("*.deb"))
     assert len(made) == 1, made
-    return made[0].rename(folder / "this.deb")
+    made[0].rename(folder / THIS.name)
 
 
-def make_next_package(this, next_agent):
+def make_next_package(next_agent, folder):
     """The same package as the next release would build it."""
-    tree = this.parent / "next"
-    lib.run("dpkg-deb", "--raw-extract", str(this), str(tree))
+    tree = folder / "next"
+    lib.run("dpkg-deb", "--raw-extract", str(folder / THIS.name), str(tree))
     units = tree / "usr/lib/systemd/user"
     (units / TIMER).rename(units / NEXT_TIMER)
     for file in [*(tree / "DEBIAN").iterdir(), *(tree / "usr/lib/systemd").rglob("*.*")]:
@@ -201,20 +201,25 @@ def make_next_package(this, next_agent):
     installed = [file for file in tree.rglob("*") if file.is_file() and "DEBIAN" not in file.parts]
     (tree / "DEBIAN/md5sums").write_text("".join(
         f"{hashlib.md5(file.read_bytes()).hexdigest()}  {file.relative_to(tree)}\n" for file in installed))
-    lib.run("dpkg-deb", "--root-owner-group", "--build", str(tree), str(this.parent / "next.deb"))
+    lib.run("dpkg-deb", "-Znone", "--root-owner-group", "--build", str(tree), str(folder / NEXT.name))
 
 
-def run_in_session(name, build, timer, next_agent):
-    with tempfile.TemporaryDirectory() as work:
-        folder = pathlib.Path(work)
-        make_next_package(make_this_package(build, folder), next_agent)
-        files = [folder / "this.deb", folder / "next.deb", __file__, lib.__file__]
-        setup = SETUP.replace("@TIMER@", timer).replace("@NEXT_TIMER@", NEXT_TIMER)
-        setup = setup.replace("@FILES@", " ".join(f"'{file}'" for file in files))
-        harness = ROOT / "tests/system/with-user-session"
-        inside = ["env", f"NORVEX_TIMER={timer}", "PYTHONDONTWRITEBYTECODE=1", PYTHON,
-                  "/run/session-test/debian_package_test.py", "--inside", name]
-        return subprocess.run([harness, "-r", "-s", setup, *inside], cwd="/").returncode
+def make_packages(build, next_agent, folder):
+    folder = pathlib.Path(folder)
+    shutil.rmtree(folder, ignore_errors=True)
+    folder.mkdir(parents=True)
+    make_this_package(build, folder)
+    make_next_package(next_agent, folder)
+
+
+def run_in_session(name, folder):
+    files = [f"{folder}/{THIS.name}", f"{folder}/{NEXT.name}", __file__, lib.__file__]
+    setup = SETUP.replace("@TIMER@", TIMER).replace("@NEXT_TIMER@", NEXT_TIMER)
+    setup = setup.replace("@FILES@", " ".join(f"'{file}'" for file in files))
+    harness = str(ROOT / "tests/system/with-user-session")
+    os.chdir("/")
+    os.execv(harness, [harness, "-r", "-s", setup, "env", f"NORVEX_TIMER={TIMER}", "PYTHONDONTWRITEBYTECODE=1", PYTHON,
+                       "/run/session-test/debian_package_test.py", "--inside", name])
 
 
 def main():
@@ -222,8 +227,10 @@ def main():
         print("\n".join(f"{lib.claim_of(name)}={name}" for name in cases))
     elif sys.argv[1] == "--inside":
         lib.run_inside(cases[sys.argv[2]])
+    elif sys.argv[1] == "--make":
+        make_packages(*sys.argv[2:])
     else:
-        sys.exit(run_in_session(*sys.argv[1:]))
+        run_in_session(*sys.argv[1:])
 
 
 if __name__ == "__main__":

@@ -259,6 +259,34 @@ def the_strict_sandbox_changes_no_figure(s):
     assert systemctl("is-enabled", TIMER, check=False) == "masked"
 
 
+@case(SLOW_TIMER)
+def the_service_is_as_closed_as_it_can_be(s):
+    """By the service manager's own measure, from 0 (closed) to 100."""
+    del s
+    unit = pathlib.Path("/usr/lib/systemd/user", SERVICE)
+    for drop_in, most_exposed in ((None, 55), ("/usr/share/norvex/strict.conf", 10)):
+        if drop_in:
+            folder = HOME / f".config/systemd/user/{SERVICE}.d"
+            folder.mkdir(parents=True)
+            (folder / "strict.conf").symlink_to(drop_in)
+        systemd_analyze("security", "--offline=true", f"--threshold={most_exposed}", str(unit))
+
+
+@case(SLOW_TIMER)
+def the_units_have_no_line_that_the_manager_does_not_know(s):
+    del s
+    complaints = systemd_analyze("verify", "--man=no", *map(str, pathlib.Path("/usr/lib/systemd/user").glob("com.brixo.*")))
+    assert complaints == "", complaints
+
+
+def systemd_analyze(*arguments):
+    """What it has to say about the units."""
+    done = subprocess.run(["systemd-analyze", "--user", "--no-pager", *arguments], capture_output=True, text=True,
+                          timeout=lib.LIMIT_S)
+    assert done.returncode == 0, done.stdout[-300:] + done.stderr
+    return done.stderr
+
+
 # Around a case.
 
 
