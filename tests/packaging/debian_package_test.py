@@ -77,6 +77,7 @@ def installed_it_reports_and_after_an_upgrade_again(s):
     s.wait_for_runs()
     this_version = int(re.search(r"run(\d+)", TIMER).group(1))
     assert s.last_version_run() == this_version and len(s.reports()) == 2
+    assert s.reports()[0]["MESSAGE_ID"] in lib.run("journalctl", "--list-catalog")
     s.assert_switched_off()
 
     dpkg("-i", NEXT)
@@ -161,6 +162,7 @@ for folder in lib cache; do
         "lowerdir=/var/$folder,upperdir=/run/machine/var-$folder/upper,workdir=/run/machine/var-$folder/work"
 done
 dpkg --purge --force-all norvex >/dev/null 2>&1 || true
+rm -f /var/lib/man-db/auto-update  # reading all manual pages anew takes longer than all else
 mkdir -p /media/volume /run/session-test
 mount -t tmpfs tmpfs /media/volume
 echo text >/media/volume/letter.txt
