@@ -145,6 +145,18 @@ def as_shipped_the_next_attempt_is_never_far(s):
     assert systemctl("show", "-P", "Persistent", TIMER) == "yes"
 
 
+@case("mkdir -p $HOME/.config/systemd/user; chown -R 4242:4242 $HOME/.config; chmod 500 $HOME/.config/systemd/user")
+def a_job_that_cannot_be_switched_off_is_tried_the_next_time(s):
+    s.wait_for_runs(2)
+    failures = [line for line in s.agent_lines() if line.startswith("Failed to disable com.brixo.NorvexAgent, error: ")]
+    assert len(failures) >= 2, s.agent_lines()
+    assert s.exit_of_agent() == "exited 0 success"
+    assert len(s.reports()) == 2 and s.last_version_run() == 4
+    (HOME / ".config/systemd/user").chmod(0o700)
+    s.journal.wait(lib.says("com.brixo.NorvexAgent disabled"), "it is switched off")
+    s.wait_for_masked()
+
+
 # By hand.
 
 
@@ -156,6 +168,20 @@ def force_reports_again_and_leaves_the_timer_on(s):
         s.journal.wait(lib.is_report, "the report", reported)
         assert s.last_version_run() == 4
         s.assert_switched_on()
+
+
+@case(SLOW_TIMER)
+def by_hand_it_waits_for_the_signal_to_run(s):
+    lib.run("norvexctl", "index", "update")
+    with subprocess.Popen([lib.AGENT]) as agent:
+        waits = pathlib.Path(f"/proc/{agent.pid}/task")
+        lib.eventually(lambda: [(thread / "wchan").read_text() for thread in waits.iterdir()].count("0") == 0
+                       and len(list(waits.iterdir())) > 1, "the agent waits in all its threads")
+        assert agent.poll() is None and s.reports() == [] and not PREFERENCES.exists()
+        agent.send_signal(signal.SIGUSR1)
+        assert agent.wait(lib.LIMIT_S) == 0
+    s.journal.wait(lib.is_report, "the report", 2)
+    s.assert_switched_off()
 
 
 # Nothing to report, and not wanted.
@@ -234,8 +260,29 @@ def ended_while_reporting_it_finishes_the_report(s):
     s.assert_switched_off()
 
 
-@case(f"{LARGE_HOME}; {SLOW_TIMER}; mkfifo {PRESSURE}; chown 4242 {PRESSURE}; "
-      f'echo Environment=MEMORY_PRESSURE_WATCH={PRESSURE} >>"/etc/systemd/user/$service.d/test.conf"')
+# A double of the file on which newer service managers tell that memory is short.
+PRESSURE_FILE = (f"mkfifo {PRESSURE}; chown 4242 {PRESSURE}; "
+                 f'echo Environment=MEMORY_PRESSURE_WATCH={PRESSURE} >>"/etc/systemd/user/$service.d/test.conf"')
+
+
+@case(f"{LARGE_HOME}; {SLOW_TIMER}; {PRESSURE_FILE}")
+def below_its_limit_it_goes_on_when_memory_is_short(s):
+    lib.fill_folder(HOME / "Downloads", 300_000)
+    systemctl("start", "--no-block", SERVICE)
+    pressure = os.open(PRESSURE, os.O_RDWR | os.O_NONBLOCK)
+    process = s.agent_process()
+    lib.wait_until_larger(process, 30_000_000)
+    os.write(pressure, b"x")
+    s.wait_for_runs()
+    try:
+        assert os.read(pressure, 1) == b"", "the agent did not see that memory is short"
+    except BlockingIOError:
+        pass  # nothing is left: the agent has taken it
+    assert sorted(s.domains()) == sorted(BOTH), s.domains()
+    assert s.last_version_run() == 4
+
+
+@case(f"{LARGE_HOME}; {SLOW_TIMER}; {PRESSURE_FILE}")
 def above_its_limit_when_memory_is_short_it_gives_up(s):
     lib.fill_folder(HOME / "Downloads", 2_000_000)
     systemctl("start", "--no-block", SERVICE)
@@ -258,11 +305,7 @@ def the_strict_sandbox_changes_no_figure(s):
     systemctl("start", SERVICE)
     systemctl("unmask", TIMER)
     PREFERENCES.unlink()
-    drop_in = HOME / f".config/systemd/user/{SERVICE}.d/strict.conf"
-    drop_in.parent.mkdir(parents=True)
-    drop_in.symlink_to("/usr/share/norvex/strict.conf")
-    systemctl("daemon-reload")
-    assert systemctl("show", "-P", "PrivateUsers", SERVICE) == "yes"
+    switch_strict_sandbox_on()
     systemctl("start", SERVICE)
     entries = s.journal.wait(lib.is_report, "both reports", 4)
     for domain in BOTH:
@@ -274,15 +317,41 @@ def the_strict_sandbox_changes_no_figure(s):
 
 
 @case(SLOW_TIMER)
+def the_strict_sandbox_hides_nothing_from_the_index(s):
+    """Of a volume that the sandbox divides: it makes mounts of the home folder's own, and of three folders in it."""
+    del s
+    mine = HOME / ".config/chronel/backup.conf"
+    mine.parent.mkdir(parents=True)
+    mine.write_text("[Backup]\nIncludedVolumes=/home\n")
+    switch_strict_sandbox_on()
+    systemctl("start", SERVICE)
+    systemctl("start", SERVICE)  # now with all that the first run has left
+    indexed = items_in_index()
+    lib.run("norvexctl", "index", "update")
+    assert items_in_index() == indexed > 10
+
+
+def switch_strict_sandbox_on():
+    drop_in = HOME / f".config/systemd/user/{SERVICE}.d/strict.conf"
+    drop_in.parent.mkdir(parents=True)
+    drop_in.symlink_to("/usr/share/norvex/strict.conf")
+    systemctl("daemon-reload")
+    assert systemctl("show", "-P", "PrivateUsers", SERVICE) == "yes"
+
+
+def items_in_index():
+    [volume] = json.loads(lib.run("norvexctl", "index", "status", "--json"))["volumes"]
+    return volume["items"]
+
+
+@case(SLOW_TIMER)
 def the_service_is_as_closed_as_it_can_be(s):
     """By the service manager's own measure, from 0 (closed) to 100."""
     del s
     unit = pathlib.Path("/usr/lib/systemd/user", SERVICE)
-    for drop_in, most_exposed in ((None, 55), ("/usr/share/norvex/strict.conf", 10)):
-        if drop_in:
-            folder = HOME / f".config/systemd/user/{SERVICE}.d"
-            folder.mkdir(parents=True)
-            (folder / "strict.conf").symlink_to(drop_in)
+    for strict, most_exposed in ((False, 55), (True, 10)):
+        if strict:
+            switch_strict_sandbox_on()
         systemd_analyze("security", "--offline=true", f"--threshold={most_exposed}", str(unit))
 
 

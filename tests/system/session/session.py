@@ -162,6 +162,9 @@ class Session:
         assert self.timer_state() == ("masked", "inactive"), self.timer_state()
         assert "com.brixo.NorvexAgent disabled" in self.agent_lines(), self.agent_lines()
 
+    def wait_for_masked(self):
+        eventually(lambda: self.timer_state() == ("masked", "inactive"), "the timer is masked")
+
     def assert_does_not_start_again(self):
         """By a timer of its own, which comes after two more turns of the agent's would have come."""
         before = self.starts()
