@@ -153,8 +153,7 @@ def a_job_that_cannot_be_switched_off_is_tried_the_next_time(s):
     assert s.exit_of_agent() == "exited 0 success"
     assert len(s.reports()) == 2 and s.last_version_run() == 4
     (HOME / ".config/systemd/user").chmod(0o700)
-    s.journal.wait(lib.says("com.brixo.NorvexAgent disabled"), "it is switched off")
-    s.wait_for_masked()
+    s.assert_switched_off()
 
 
 # By hand.

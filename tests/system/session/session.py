@@ -159,11 +159,8 @@ class Session:
         assert self.timer_state() == ("enabled", "active"), self.timer_state()
 
     def assert_switched_off(self):
+        self.journal.wait(says("com.brixo.NorvexAgent disabled"), "the agent has switched its job off")
         assert self.timer_state() == ("masked", "inactive"), self.timer_state()
-        assert "com.brixo.NorvexAgent disabled" in self.agent_lines(), self.agent_lines()
-
-    def wait_for_masked(self):
-        eventually(lambda: self.timer_state() == ("masked", "inactive"), "the timer is masked")
 
     def assert_does_not_start_again(self):
         """By a timer of its own, which comes after two more turns of the agent's would have come."""
