@@ -166,7 +166,9 @@ void CrawlFolderReader::readItems(const CrawlFolder& folder, const CrawlNames& n
 void CrawlFolderReader::readItem(const CrawlFolder& folder, std::string_view name, const char* text,
                                  CrawlBatch& batch) {
   struct statx status {};
-  if (::statx(folder.fd.get(), text, volume_.statFlags(), kWanted, &status) != 0) {
+  // Relative to the current folder the kernel has no descriptor to look up and to hold.
+  const int from = isCurrent_ ? AT_FDCWD : folder.fd.get();
+  if (::statx(from, text, volume_.statFlags(), kWanted, &status) != 0) {
     if (!hasVanished(errno)) batch.problems.add(folder.absolute + "/" + text, errno);
     return;
   }
