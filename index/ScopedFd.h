@@ -1,35 +1,15 @@
-// A file descriptor that is closed with its scope.
-//
-// Used inside this room, on any thread. Movable; owned by whoever holds it.
+// The descriptors of the crawl and of the store's writer: a FileDescriptor whose number is called get().
 #pragma once
 
-#include <unistd.h>
-
-#include <utility>
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 
-class ScopedFd {
+class ScopedFd final : public FileDescriptor {
  public:
-  ScopedFd() = default;
-  explicit ScopedFd(int fd) : fd_(fd) {}
-  ScopedFd(ScopedFd&& other) noexcept : fd_(std::exchange(other.fd_, -1)) {}
-  ScopedFd& operator=(ScopedFd&& other) noexcept {
-    if (this != &other) reset(std::exchange(other.fd_, -1));
-    return *this;
-  }
-  ~ScopedFd() { reset(-1); }
+  using FileDescriptor::FileDescriptor;
 
-  int get() const { return fd_; }
-  explicit operator bool() const { return fd_ >= 0; }
-
- private:
-  void reset(int fd) {
-    if (fd_ >= 0) ::close(fd_);
-    fd_ = fd;
-  }
-
-  int fd_ = -1;
+  int get() const { return number(); }
 };
 
 }  // namespace norvex

@@ -21,8 +21,8 @@ constexpr off_t kPageBytes = 4096;
 
 // Writes `bytes` over a page of the store's file, which is already open elsewhere.
 void overwritePage(const TestVolume& volume, off_t page, const std::string& bytes) {
-  const ScopedFd file(::open(volume.storePath().c_str(), O_WRONLY | O_CLOEXEC));
-  ASSERT_EQ(::pwrite(file.get(), bytes.data(), bytes.size(), page * kPageBytes),
+  const FileDescriptor file(::open(volume.storePath().c_str(), O_WRONLY | O_CLOEXEC));
+  ASSERT_EQ(::pwrite(file.number(), bytes.data(), bytes.size(), page * kPageBytes),
             static_cast<ssize_t>(bytes.size()));
 }
 
@@ -82,8 +82,8 @@ TEST(FailingStore, EndsEveryQueryWhicheverPageIsAnother) {
     OpenedVolume opened;
     const off_t page = pagesOf(opened.volume) * step / kSteps;
     std::string other(kPageBytes, '\0');
-    const ScopedFd file(::open(opened.volume.storePath().c_str(), O_RDONLY | O_CLOEXEC));
-    ASSERT_EQ(::pread(file.get(), other.data(), other.size(), (page - 1) * kPageBytes), kPageBytes);
+    const FileDescriptor file(::open(opened.volume.storePath().c_str(), O_RDONLY | O_CLOEXEC));
+    ASSERT_EQ(::pread(file.number(), other.data(), other.size(), (page - 1) * kPageBytes), kPageBytes);
     overwritePage(opened.volume, page, other);
     for (const char* predicate : {"kMDItemContentTypeTree == 'odd'", "kMDItemPath == '*/f77'", "none == 1"}) {
       EXPECT_LE(opened.search(predicate).size(), static_cast<std::size_t>(kItems)) << page << predicate;

@@ -19,8 +19,8 @@
 
 #include "media/Boxes.h"
 #include "media/TempFolder.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/CallablePath.h"
-#include "platform/linux/FileDescriptor.h"
 #include "tests/support/TreeOnDisk.h"
 
 namespace norvex {

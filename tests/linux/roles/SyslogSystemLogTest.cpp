@@ -10,7 +10,7 @@
 #include <cstring>
 
 #include "ChildProcess.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 namespace {
