@@ -36,9 +36,10 @@ void writeText(ToolWorld& world, const VolumeStatus& status) {
   out.stream() << out.inked(Console::Ink::bold, safeText(status.root)) << '\n'
                << label("Updated     ") << localTime(status.updated) << " ("
                << ageText(world.secondsSince1970() - status.updated) << ")\n"
-               << label("Items       ") << counts.files + counts.folders << " ("
-               << countText(counts.files, "file") << ", " << countText(counts.folders, "folder") << ")\n"
-               << label("Unreadable  ") << counts.unreadable << '\n'
+               << label("Items       ") << world.digits(counts.files + counts.folders) << " ("
+               << countText(world.digits, counts.files, "file") << ", "
+               << countText(world.digits, counts.folders, "folder") << ")\n"
+               << label("Unreadable  ") << world.digits(counts.unreadable) << '\n'
                << label("Index       ") << world.byteCounts.string(status.storeBytes) << "\n\n";
   writeSizeBars(out, world.byteCounts, status.sizes);
 }

@@ -13,6 +13,7 @@
 #include "platform/ByteCountFormatter.h"
 #include "platform/Clock.h"
 #include "tool/Console.h"
+#include "tool/FigureText.h"
 
 namespace norvex {
 
@@ -23,6 +24,7 @@ struct ToolWorld {
   const StoreFolder& stores;
   BackupSettings& backupSettings;
   const ByteCountFormatter& byteCounts;
+  DigitsText digits;   // of counts
   const Clock& clock;  // for elapsed times
 
   std::function<std::int64_t()> secondsSince1970;                // the present moment, for people

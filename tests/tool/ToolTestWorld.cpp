@@ -58,6 +58,7 @@ ToolTestWorld::ToolTestWorld(const ConsoleStyle& style)
             stores,
             settings,
             byteCounts,
+            [](std::uint64_t number) { return std::to_string(number); },
             clock,
             [] { return kIndexed + 120; },
             [this](const std::string& path) { return path == volume(); },
