@@ -8,8 +8,8 @@
 #include <cstdio>
 #include <utility>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/DiagnosticMessageText.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {

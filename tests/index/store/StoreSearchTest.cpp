@@ -5,6 +5,7 @@
 
 #include <algorithm>
 
+#include "StoredItems.h"
 #include "TestVolume.h"
 #include "index/PredicateParser.h"
 
@@ -36,21 +37,12 @@ Found findAll(StoreReader& store, const char* predicate) {
   return found;
 }
 
-// A store of some real items and of many more, files of the root of the types 1 to 3, from a number on.
 class LargeStore {
  public:
   explicit LargeStore(std::int64_t first, std::int64_t count = kItems) {
     volume_.file("a.jpg");
     EXPECT_TRUE(volume_.update().ok());
-    const std::string from = std::to_string(first), to = std::to_string(first + count);
-    volume_.tamper(
-        ("DELETE FROM types; DELETE FROM type_tree; UPDATE items SET type=0;"
-         "INSERT INTO types VALUES(0,'zero','Zero'),(1,'one','One'),(2,'two','Two'),(3,'three','Three');"
-         "INSERT INTO type_tree VALUES('odd',1),('odd',3);"
-         "WITH RECURSIVE n(id) AS (SELECT " +
-         from + " UNION ALL SELECT id+1 FROM n WHERE id+1<" + to +
-         ") INSERT INTO items SELECT id, 1, 'f' || id, 1 + id % 3, id, 0 FROM n")
-            .c_str());
+    addStoredItems(volume_, first, count);
     auto opened = volume_.open();
     if (opened) store_ = std::move(opened).value();
   }
