@@ -32,6 +32,7 @@ class Grammar {
     addIndexShow(*index);
     addPreview();
     addSummary();
+    addShow();
   }
 
   // The command that was parsed, with its arguments.
@@ -106,6 +107,14 @@ class Grammar {
 
   void addSummary() {
     addNoIndex(add<SummaryRequest>(program, "summary", "Show every figure exactly", help::kSummary));
+  }
+
+  void addShow() {
+    const auto command = add<ShowRequest>(program, "show", "Show where the space went", help::kShow);
+    addNoIndex(command);
+    command.app.add_option("--html", command.request.htmlFile, "Write a page for the browser into this file")
+        ->type_name("FILE")
+        ->excludes(command.app.get_option("--json"));
   }
 
   std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;

@@ -15,6 +15,7 @@ struct CommandRunner {
   ExitStatus operator()(const IndexQueryRequest& request) const { return runIndexQuery(world, request); }
   ExitStatus operator()(const IndexShowRequest& request) const { return runIndexShow(world, request); }
   ExitStatus operator()(const PreviewRequest& request) const { return runPreview(world, request); }
+  ExitStatus operator()(const ShowRequest& request) const { return runShow(world, request); }
   ExitStatus operator()(const SummaryRequest& request) const { return runSummary(world, request); }
 };
 

@@ -56,4 +56,11 @@ inline constexpr const char* kSummary =
     "Example:\n"
     "  norvexctl summary | grep -i music";
 
+inline constexpr const char* kShow =
+    "Shows each volume, what is on it by kind, where images, music and movies lie, and what was bought.\n"
+    "The page of --html needs no network; it replaces the file in one step, readable by you alone.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl show --html ~/storage.html";
+
 }  // namespace norvex::help

@@ -1,5 +1,8 @@
 #include "MeasuredWorld.h"
 
+#include <time.h>
+
+#include <cstdlib>
 #include <vector>
 
 namespace norvex {
@@ -31,7 +34,7 @@ MeasuredWorld::MeasuredWorld(const ConsoleStyle& style)
             .err = err_,
             .stores = stores_,
             .backupSettings = backupSettings,
-            .byteCounts = byteCountFormatter,
+            .byteCounts = byteCounts_,
             .digits = grouped,
             .clock = clock,
             .secondsSince1970 = [] { return kNow; },
@@ -39,6 +42,8 @@ MeasuredWorld::MeasuredWorld(const ConsoleStyle& style)
             .absolute = [](const std::string& path) { return path; },
             .dataHome = cache_.path("data"),
             .cancelled = cancelled_} {
+  ::setenv("TZ", "UTC0", 1);
+  ::tzset();
   fillStartupDisk();
   fillOtherDisk();
   backupSettings.content->automaticBackupsEnabled = true;
