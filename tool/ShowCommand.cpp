@@ -15,6 +15,7 @@
 #include "tool/SizeBars.h"
 #include "tool/StoragePage.h"
 #include "tool/StorageReport.h"
+#include "tool/WrappedText.h"
 
 namespace norvex {
 namespace {
@@ -61,7 +62,8 @@ class ShowText {
       return;
     }
     writeSizeBars(world_.out, world_.byteCounts, bars, kLabelColumns);
-    if (!group.note.empty()) out() << "  " << world_.out.inked(Console::Ink::dim, group.note) << '\n';
+    for (const std::string& line : wrappedText(group.note, world_.out.style().width - 2))
+      out() << "  " << world_.out.inked(Console::Ink::dim, line) << '\n';
   }
 
   ToolWorld& world_;
