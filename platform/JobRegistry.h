@@ -19,8 +19,9 @@ class JobRegistry {
   virtual ~JobRegistry() = default;
 
   // Switches the job `label` off, so that it is not started again, also after a restart, until it is switched
-  // on from outside. A job that is already off is a success. On failure the job is as it was and the error
-  // says why. A run of the job that is under way goes on.
+  // on from outside. A job that is already off is a success. On failure the error says why; the job is then
+  // as it was or, where only the last steps have failed, off from the next log-in on. A run of the job that
+  // is under way goes on.
   virtual Result<void> disableJob(JobDomain domain, const std::string& label) = 0;
 };
 

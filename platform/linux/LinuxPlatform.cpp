@@ -19,6 +19,7 @@ LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environmen
       userFolders_(folders_),
       backupSettings_({folders_.config, kSystemConfigFolder}, systemLog_),
       diagnosticLog_(folders_.state),
+      jobRegistry_(environment),
       preferenceStore_(folders_.config + kOwnFolder),
       activityScheduler_(environment) {}
 

@@ -5,7 +5,6 @@
 
 #include "platform/MetadataIndex.h"
 #include "platform/Platform.h"
-#include "platform/linux/AbsentJobRegistry.h"
 #include "platform/linux/ConfBackupSettings.h"
 #include "platform/linux/Environment.h"
 #include "platform/linux/FileDiagnosticLog.h"
@@ -26,6 +25,7 @@
 #include "platform/linux/StatvfsVolumeCatalog.h"
 #include "platform/linux/SteadyClock.h"
 #include "platform/linux/ThreadEventLoops.h"
+#include "platform/linux/UserManagerJobRegistry.h"
 #include "platform/linux/XdgFolders.h"
 
 namespace norvex {
@@ -61,7 +61,7 @@ class LinuxPlatform {
   ThreadEventLoops eventLoops_;
   LinuxFileExistence fileExistence_;
   MarkerFileInstallation installation_;
-  AbsentJobRegistry jobRegistry_;
+  UserManagerJobRegistry jobRegistry_;
   Mpeg4MediaReader mediaMetadataReader_;
   SilentMemoryPressureSource memoryPressureSource_;
   JsonPreferenceStore preferenceStore_;

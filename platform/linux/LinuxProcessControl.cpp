@@ -1,7 +1,6 @@
 #include "platform/linux/LinuxProcessControl.h"
 
 #include <dirent.h>
-#include <linux/ioprio.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -12,6 +11,8 @@
 #include <memory>
 #include <set>
 #include <string_view>
+
+#include "platform/linux/IoPriority.h"
 
 namespace norvex {
 namespace {
@@ -32,8 +33,7 @@ void setAction(void (*action)(int)) {
 
 // The C library has no wrapper for this call. 0 is the calling thread.
 void throttleThread(pid_t thread) {
-  constexpr int kIdle = IOPRIO_PRIO_VALUE(IOPRIO_CLASS_IDLE, 0);
-  ::syscall(SYS_ioprio_set, IOPRIO_WHO_PROCESS, thread, kIdle);
+  ::syscall(SYS_ioprio_set, kIoPriorityOfProcess, thread, ioPriority(kIoClassIdle));
 }
 
 // Throttles the threads that are not yet in `done`. False when there were none.

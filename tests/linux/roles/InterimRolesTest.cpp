@@ -1,19 +1,9 @@
 #include <gtest/gtest.h>
 
-#include <cerrno>
-
-#include "platform/linux/AbsentJobRegistry.h"
 #include "platform/linux/SilentMemoryPressureSource.h"
 
 namespace norvex {
 namespace {
-
-TEST(AbsentJobRegistry, SaysThatItSwitchesNothingOff) {
-  const Result<void> outcome = AbsentJobRegistry().disableJob(JobDomain::user, "com.brixo.NorvexAgent");
-  ASSERT_FALSE(outcome);
-  EXPECT_EQ(outcome.error().code, ENOSYS);
-  EXPECT_EQ(outcome.error().description, "Function not implemented");
-}
 
 TEST(SilentMemoryPressureSource, CanBeSubscribedToAndStaysSilent) {
   int calls = 0;

@@ -1,5 +1,4 @@
 #include <gtest/gtest.h>
-#include <linux/ioprio.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -7,20 +6,21 @@
 #include <thread>
 #include <vector>
 
+#include "platform/linux/IoPriority.h"
 #include "platform/linux/LinuxProcessControl.h"
 
 namespace norvex {
 namespace {
 
 long ownIoClass() {
-  const long priority = ::syscall(SYS_ioprio_get, IOPRIO_WHO_PROCESS, 0);
-  return priority < 0 ? priority : IOPRIO_PRIO_CLASS(priority);
+  const long priority = ::syscall(SYS_ioprio_get, kIoPriorityOfProcess, 0);
+  return priority < 0 ? priority : ioClassOf(static_cast<int>(priority));
 }
 
 bool mayBeIdle() {
-  const int idle = IOPRIO_PRIO_VALUE(IOPRIO_CLASS_IDLE, 0);
+  const int idle = ioPriority(kIoClassIdle);
   long status = 0;
-  std::thread([&] { status = ::syscall(SYS_ioprio_set, IOPRIO_WHO_PROCESS, 0, idle); }).join();
+  std::thread([&] { status = ::syscall(SYS_ioprio_set, kIoPriorityOfProcess, 0, idle); }).join();
   return status == 0;
 }
 
@@ -49,12 +49,12 @@ TEST(ProcessControl, ThrottlesTheThreadsThatAreAndThoseThatWillBe) {
   long startedLater = -1;
   std::thread([&] { startedLater = ownIoClass(); }).join();
 
-  const std::vector<long> allIdle(kThreads, IOPRIO_CLASS_IDLE);
+  const std::vector<long> allIdle(kThreads, kIoClassIdle);
   EXPECT_NE(before, allIdle) << "the test was started with the lowest priority and shows nothing";
-  EXPECT_EQ(ownIoClass(), IOPRIO_CLASS_IDLE);
+  EXPECT_EQ(ownIoClass(), kIoClassIdle);
   EXPECT_EQ(after, allIdle);
   EXPECT_EQ(startedByThem, allIdle);
-  EXPECT_EQ(startedLater, IOPRIO_CLASS_IDLE);
+  EXPECT_EQ(startedLater, kIoClassIdle);
 }
 
 }  // namespace
