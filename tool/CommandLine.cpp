@@ -33,6 +33,7 @@ class Grammar {
     addPreview();
     addSummary();
     addShow();
+    addLog();
   }
 
   // The command that was parsed, with its arguments.
@@ -115,6 +116,13 @@ class Grammar {
     command.app.add_option("--html", command.request.htmlFile, "Write a page for the browser into this file")
         ->type_name("FILE")
         ->excludes(command.app.get_option("--json"));
+  }
+
+  void addLog() {
+    const auto [app, request] = add<LogRequest>(program, "log", "Show what has been reported", help::kLog);
+    app.add_option("--since", request.since, "Only from this moment on")->type_name("MOMENT");
+    app.add_option("--domain", request.domain, "Only messages of this domain, or ending so, such as run2")
+        ->type_name("DOMAIN");
   }
 
   std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;

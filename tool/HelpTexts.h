@@ -63,4 +63,11 @@ inline constexpr const char* kShow =
     "Example:\n"
     "  norvexctl show --html ~/storage.html";
 
+inline constexpr const char* kLog =
+    "From the system's journal, and from the agent's own file where there was no journal; the newest last.\n"
+    "A MOMENT: 2026-11-21, \"2026-11-21 07:03\", today, or how long ago: 45min, 12h, 3d, 2w.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl log --since 2w --domain run2";
+
 }  // namespace norvex::help

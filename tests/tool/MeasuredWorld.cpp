@@ -41,6 +41,8 @@ MeasuredWorld::MeasuredWorld(const ConsoleStyle& style)
             .isMountPoint = [](const std::string& path) { return path == "/" || path == kOtherDisk; },
             .absolute = [](const std::string& path) { return path; },
             .dataHome = cache_.path("data"),
+            .messagesFile = cache_.path("diagnostics.jsonl"),
+            .agentJournal = journal,
             .cancelled = cancelled_} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();

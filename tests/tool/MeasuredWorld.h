@@ -7,6 +7,7 @@
 #include <sstream>
 #include <string>
 
+#include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
 #include "tests/scanner/ScanWorld.h"
@@ -40,6 +41,7 @@ class MeasuredWorld : public ScanWorld {
   std::atomic<bool> cancelled_{false};
 
  public:
+  InMemoryAgentJournal journal;
   ToolWorld world;
 };
 
