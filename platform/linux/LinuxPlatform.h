@@ -8,6 +8,7 @@
 #include "platform/linux/ConfBackupSettings.h"
 #include "platform/linux/Environment.h"
 #include "platform/linux/FileDiagnosticLog.h"
+#include "platform/linux/JournalDiagnosticLog.h"
 #include "platform/linux/JsonPreferenceStore.h"
 #include "platform/linux/LinuxActivityScheduler.h"
 #include "platform/linux/LinuxDirectoryEnumeration.h"
@@ -55,7 +56,8 @@ class LinuxPlatform {
   ConfBackupSettings backupSettings_;
   LocaleByteCountFormatter byteCountFormatter_;
   SteadyClock clock_;
-  FileDiagnosticLog diagnosticLog_;
+  FileDiagnosticLog diagnosticFile_;
+  JournalDiagnosticLog diagnosticLog_;
   LinuxDirectoryEnumeration directoryEnumeration_;
   LinuxDirectoryListing directoryListing_;
   ThreadEventLoops eventLoops_;
