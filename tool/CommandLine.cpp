@@ -32,6 +32,8 @@ class Grammar {
     addIndexShow(*index);
     addPreview();
     addSummary();
+    addShow();
+    addLog();
   }
 
   // The command that was parsed, with its arguments.
@@ -106,6 +108,21 @@ class Grammar {
 
   void addSummary() {
     addNoIndex(add<SummaryRequest>(program, "summary", "Show every figure exactly", help::kSummary));
+  }
+
+  void addShow() {
+    const auto command = add<ShowRequest>(program, "show", "Show where the space went", help::kShow);
+    addNoIndex(command);
+    command.app.add_option("--html", command.request.htmlFile, "Write a page for the browser into this file")
+        ->type_name("FILE")
+        ->excludes(command.app.get_option("--json"));
+  }
+
+  void addLog() {
+    const auto [app, request] = add<LogRequest>(program, "log", "Show what has been reported", help::kLog);
+    app.add_option("--since", request.since, "Only from this moment on")->type_name("MOMENT");
+    app.add_option("--domain", request.domain, "Only messages of this domain, or ending so, such as run2")
+        ->type_name("DOMAIN");
   }
 
   std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;

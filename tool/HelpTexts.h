@@ -56,4 +56,18 @@ inline constexpr const char* kSummary =
     "Example:\n"
     "  norvexctl summary | grep -i music";
 
+inline constexpr const char* kShow =
+    "Shows each volume, what is on it by kind, where images, music and movies lie, and what was bought.\n"
+    "The page of --html needs no network; it replaces the file in one step, readable by you alone.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl show --html ~/storage.html";
+
+inline constexpr const char* kLog =
+    "From the system's journal, and from the agent's own file where there was no journal; the newest last.\n"
+    "A MOMENT: 2026-11-21, \"2026-11-21 07:03\", today, or how long ago: 45min, 12h, 3d, 2w.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl log --since 2w --domain run2";
+
 }  // namespace norvex::help

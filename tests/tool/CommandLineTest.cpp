@@ -71,6 +71,8 @@ TEST(CommandLine, HelpOfEveryCommandHasAnExample) {
                                             {"index", "query", "--help"},
                                             {"index", "show", "--help"},
                                             {"preview", "--help"},
+                                            {"log", "--help"},
+                                            {"show", "--help"},
                                             {"summary", "--help"}};
   for (const auto& arguments : cases) {
     const Parsed parsed = parse(arguments);

@@ -64,6 +64,8 @@ ToolTestWorld::ToolTestWorld(const ConsoleStyle& style)
             [this](const std::string& path) { return path == volume(); },
             [](const std::string& path) { return path; },
             cache.path("data"),
+            cache.path("diagnostics.jsonl"),
+            journal,
             cancelled} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();
