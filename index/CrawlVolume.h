@@ -30,7 +30,7 @@ class CrawlVolume {
   CrawlVolume(CrawlVolume&& other) noexcept;
 
   const std::string& root() const { return root_; }
-  int rootFd() const { return fd_.get(); }
+  int rootFd() const { return fd_.number(); }
 
   // The absolute path of what is at `path` below the root.
   std::string absolute(std::string_view path) const;
