@@ -1,16 +1,15 @@
 // The scanner on the roles of Linux, for measuring its walks as the agent makes them.
 #pragma once
 
-#include "index/StoredMetadataIndex.h"
-#include "platform/Platform.h"
-#include "platform/linux/LinuxPlatform.h"
+#include "machine/MachinePlatform.h"
+#include "platform/linux/SyslogSystemLog.h"
 #include "scanner/NVXScanner.h"
 
 namespace norvex::bench {
 
 class MeasuredScanner {
  public:
-  MeasuredScanner() : linux_(0, nullptr, processEnvironment()) {}
+  MeasuredScanner() : machine_(0, nullptr, processEnvironment(), systemLog_) {}
 
   std::uint64_t sizeOf(const Location& folder) { return scanner_.sizeForDirectory(folder); }
 
@@ -44,11 +43,9 @@ class MeasuredScanner {
   }
 
  private:
-  LinuxPlatform linux_;
-  VolumeStores stores_{StoreFolder(linux_.folders().cache + "/norvex")};
-  StoredMetadataIndex index_{stores_, linux_.eventLoops()};
-  const Platform roles_ = linux_.roles(index_, linux_.volumeCatalog());
-  const ScopedPlatform installed_{roles_};
+  SyslogSystemLog systemLog_;
+  MachinePlatform machine_;
+  const ScopedPlatform installed_{machine_.roles()};
   NVXScanner scanner_;
 };
 

@@ -45,6 +45,15 @@ endfunction()
 # All threaded test programs, and so all that a build for the thread sanitizer needs.
 add_custom_target(norvex_threaded_tests)
 
+# norvex_golden_files(NAME)
+#
+# Gives the test program NAME the expected outputs in the folder "golden" beside it (tests/golden/GoldenFile.h).
+function(norvex_golden_files name)
+  target_sources(${name} PRIVATE ${CMAKE_SOURCE_DIR}/tests/golden/GoldenFile.cpp)
+  target_include_directories(${name} PRIVATE ${CMAKE_SOURCE_DIR}/tests/golden)
+  target_compile_definitions(${name} PRIVATE NORVEX_GOLDEN_FOLDER="${CMAKE_CURRENT_SOURCE_DIR}/golden")
+endfunction()
+
 # norvex_test(NAME SOURCES a.cpp ... LIBRARIES norvex_x ... [THREADED])
 #
 # Declares the test program NAME and every test in it. THREADED gives its tests the label "threaded": they run

@@ -14,6 +14,9 @@ namespace {
 
 enum Argument { kValue, kOperator, kLiteral, kIgnoresCase, kIgnoresDiacritics, kArgumentCount };
 
+// The parameters of a predicate's statement.
+enum Parameter { kFirstItem = 1, kLastItem, kFirstValue };
+
 Error sqliteError(int code) {
   return Error{code, sqlite3_errstr(code)};
 }
@@ -114,8 +117,13 @@ Result<void> registerPredicateFunctions(sqlite3* connection) {
   return code == SQLITE_OK ? Result<void>() : Result<void>(sqliteError(code));
 }
 
-Result<void> bindPredicateValues(sqlite3_stmt* statement, const PredicateSql& sql, int first) {
-  int index = first;
+void bindItemRange(sqlite3_stmt* statement, std::int64_t first, std::int64_t last) {
+  sqlite3_bind_int64(statement, kFirstItem, first);
+  sqlite3_bind_int64(statement, kLastItem, last);
+}
+
+Result<void> bindPredicateValues(sqlite3_stmt* statement, const PredicateSql& sql) {
+  int index = kFirstValue;
   for (const SqlValue& value : sql.values) {
     const int code = bindOne(statement, index++, value);
     if (code != SQLITE_OK) return sqliteError(code);

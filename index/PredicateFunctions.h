@@ -16,9 +16,11 @@ namespace norvex {
 // SQLite's.
 Result<void> registerPredicateFunctions(sqlite3* connection);
 
-// Binds the values of a compiled predicate to the statement's parameters `first`, `first` + 1, ... (the first
-// parameter of a statement is 1). Their bytes are copied. On failure some parameters may be bound; the
-// error's code is SQLite's.
-Result<void> bindPredicateValues(sqlite3_stmt* statement, const PredicateSql& sql, int first = 1);
+// Binds the values of a compiled predicate to its statement. Their bytes are copied. On failure some
+// parameters may be bound; the error's code is SQLite's.
+Result<void> bindPredicateValues(sqlite3_stmt* statement, const PredicateSql& sql);
+
+// Binds the first and the last item that the statement looks at. The statement is not running.
+void bindItemRange(sqlite3_stmt* statement, std::int64_t first, std::int64_t last);
 
 }  // namespace norvex

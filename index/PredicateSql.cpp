@@ -37,7 +37,8 @@ constexpr std::array kBuiltIn{
 // For every other attribute; takes its name.
 constexpr Source kSparse{
     "", "value", Holds::Anything,
-    "i.id IN (SELECT item FROM attributes WHERE name = (SELECT id FROM attribute_names WHERE name = ?) AND ",
+    "i.id IN (SELECT item FROM attributes WHERE name = (SELECT id FROM attribute_names WHERE name = ?) AND "
+    "item >= ?1 AND item <= ?2 AND ",
     ")"};
 
 constexpr std::string_view spelling(PredicateOperator comparison) {
@@ -202,6 +203,11 @@ PredicateSql compilePredicate(const Predicate& predicate) {
   Writer writer;
   writer.add(predicate);
   return writer.take();
+}
+
+// Two comparisons and no BETWEEN, which SQLite does not hand down to the indexes within an OR.
+std::string queryOf(const PredicateSql& sql) {
+  return "SELECT i.id FROM items AS i WHERE i.id >= ?1 AND i.id <= ?2 AND (" + sql.where + ")";
 }
 
 }  // namespace norvex

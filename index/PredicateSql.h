@@ -1,7 +1,8 @@
 // A predicate as SQL: the condition of a query over the items of a volume's store.
 //
-// Any thread. Pure. The statement that takes the condition reads `... FROM items AS i WHERE <condition>`, on
-// a connection that registerPredicateFunctions (PredicateFunctions.h) has prepared. What it expects there:
+// Any thread. Pure. queryOf() makes the statement; it runs on a connection that registerPredicateFunctions
+// (PredicateFunctions.h) has prepared, over a range of items, whose first and last number are its parameters
+// 1 and 2. What it expects there:
 //
 //   items i(id INTEGER PRIMARY KEY, parent INTEGER, name BLOB, type INTEGER, size INTEGER, mtime INTEGER)
 //     size is NULL for folders; mtime counts nanoseconds since 1970; name is never NULL
@@ -12,9 +13,10 @@
 //     a value that numberFromText (NumberText.h) reads is stored as that number, every other as TEXT or BLOB
 //   path_of(id)                              a function: the item's path, TEXT or BLOB
 //
-// An index on items(type) serves the tests of types. The tests of attributes that only some items have start
-// from `attributes`; its primary key serves them. The store keeps no statistics (ANALYZE): with them SQLite
-// takes a list of types for 25 average types, and on a store of few types reads every item instead.
+// An index on items(type) serves the tests of types, from the range's first item on. The tests of attributes
+// that only some items have start from `attributes`; its primary key serves them. The store keeps no
+// statistics (ANALYZE): with them SQLite takes a list of types for 25 average types, and on a store of few
+// types reads every item instead.
 //
 // kMDItemFSContentChangeDate is the number of seconds since 1970 as the double mtime / 1e9.
 #pragma once
@@ -39,13 +41,16 @@ using SqlValue = std::variant<std::int64_t, double, SqlText, SqlBlob>;
 
 struct PredicateSql {
   // True for the items that match, false or NULL for the others. Holds nothing of the predicate's own text:
-  // attribute names and values are bound.
+  // attribute names and values are bound. For the items of the range only.
   std::string where;
-  // For the parameters of `where`, one "?" each, in their order.
+  // For the parameters of `where`, one "?" each, in their order, behind those of the range.
   std::vector<SqlValue> values;
 };
 
 // Compiles any predicate that the parser yields; never fails.
 PredicateSql compilePredicate(const Predicate& predicate);
+
+// The statement that finds the matches: their ids in any order.
+std::string queryOf(const PredicateSql& sql);
 
 }  // namespace norvex

@@ -1,8 +1,9 @@
 #include "index/SparseAttributes.h"
 
 #include <algorithm>
-#include <charconv>
 #include <string>
+
+#include "index/NumberText.h"
 
 namespace norvex {
 namespace {
@@ -15,42 +16,6 @@ constexpr std::string_view builtInAttributes[] = {
     "kMDItemPath",        "kMDItemFSName",          "kMDItemFSSize", "kMDItemFSContentChangeDate",
     "kMDItemContentType", "kMDItemContentTypeTree", "kMDItemKind",
 };
-
-bool takeDigits(std::string_view& text) {
-  const std::size_t count = std::min(text.find_first_not_of("0123456789"), text.size());
-  text.remove_prefix(count);
-  return count > 0;
-}
-
-bool takeAnyOf(std::string_view& text, std::string_view characters) {
-  if (text.empty() || characters.find(text.front()) == std::string_view::npos) return false;
-  text.remove_prefix(1);
-  return true;
-}
-
-enum class Form { text, whole, fractional };
-
-Form formOf(std::string_view text) {
-  takeAnyOf(text, "+-");
-  if (!takeDigits(text)) return Form::text;
-  if (text.empty()) return Form::whole;
-  if (takeAnyOf(text, ".") && !takeDigits(text)) return Form::text;
-  if (takeAnyOf(text, "eE")) {
-    takeAnyOf(text, "+-");
-    if (!takeDigits(text)) return Form::text;
-  }
-  return text.empty() ? Form::fractional : Form::text;
-}
-
-template <typename Number>
-std::optional<Number> convert(std::string_view text) {
-  // The conversion takes a minus sign only.
-  if (text.starts_with('+')) text.remove_prefix(1);
-  Number number{};
-  const auto [stop, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-  if (error != std::errc() || stop != text.data() + text.size()) return std::nullopt;
-  return number;
-}
 
 }  // namespace
 
@@ -73,13 +38,8 @@ std::string_view withoutTerminator(std::string_view value) {
 
 MetadataValue parseSparseValue(std::string_view value) {
   const std::string_view text = withoutTerminator(value);
-  const Form form = formOf(text);
-  if (form == Form::whole) {
-    if (const auto integer = convert<std::int64_t>(text)) return *integer;
-  }
-  if (form != Form::text) {
-    if (const auto number = convert<double>(text)) return *number;
-  }
+  const auto number = numberFromText(text);
+  if (number) return std::visit([](auto plain) { return MetadataValue(plain); }, *number);
   return std::string(text);
 }
 

@@ -18,9 +18,8 @@ std::optional<std::string_view> sparseAttributeName(std::string_view extendedAtt
 // The value without the one line feed or zero byte that tools leave at its end.
 std::string_view withoutTerminator(std::string_view value);
 
-// The attribute's value, its terminator dropped. A number is an optional sign, digits, an optional fraction
-// and an optional exponent, with nothing around: a 64-bit integer when it is whole and fits, else a double.
-// All else is text, byte for byte, empty text included; so is a number that no double can hold.
+// The attribute's value, its terminator dropped: the number that it spells (NumberText.h), a 64-bit integer
+// when it is whole and fits, else a double. All else is text, byte for byte, empty text included.
 MetadataValue parseSparseValue(std::string_view value);
 
 }  // namespace norvex

@@ -62,12 +62,12 @@ Result<void> makeFolders(const std::string& path) {
 }
 
 Result<void> writeCacheTag(const std::string& path) {
-  const ScopedFd file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC | O_NOFOLLOW, 0600));
+  const FileDescriptor file(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC | O_NOFOLLOW, 0600));
   if (!file) {
     if (errno == EEXIST) return {};
     return systemError(errno);
   }
-  if (::write(file.get(), kCacheTag.data(), kCacheTag.size()) == static_cast<ssize_t>(kCacheTag.size()))
+  if (::write(file.number(), kCacheTag.data(), kCacheTag.size()) == static_cast<ssize_t>(kCacheTag.size()))
     return {};
   const int code = errno;
   ::unlink(path.c_str());  // half a tag would stay for ever
@@ -75,8 +75,8 @@ Result<void> writeCacheTag(const std::string& path) {
 }
 
 Result<void> syncPath(const std::string& path, int flags) {
-  const ScopedFd fd(::open(path.c_str(), flags | O_CLOEXEC));
-  if (!fd || ::fsync(fd.get()) != 0) return systemError(errno);
+  const FileDescriptor fd(::open(path.c_str(), flags | O_CLOEXEC));
+  if (!fd || ::fsync(fd.number()) != 0) return systemError(errno);
   return {};
 }
 
@@ -108,10 +108,10 @@ Result<void> StoreFolder::publish(std::string_view volumeRoot) const {
 
 Result<StoreLock> StoreLock::take(const std::string& lockPath, bool wait,
                                   const std::atomic<bool>& cancelled) {
-  ScopedFd fd(::open(lockPath.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0600));
+  FileDescriptor fd(::open(lockPath.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0600));
   if (!fd) return systemError(errno);
   // Asked again and again: a blocked flock() could not be given up.
-  while (::flock(fd.get(), LOCK_EX | LOCK_NB) != 0) {
+  while (::flock(fd.number(), LOCK_EX | LOCK_NB) != 0) {
     if (errno == EINTR) continue;
     if (errno != EWOULDBLOCK) return systemError(errno);
     if (!wait) return Error{EBUSY, "another update of this volume is under way"};

@@ -8,7 +8,7 @@
 #include <string>
 #include <string_view>
 
-#include "index/ScopedFd.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Result.h"
 
 namespace norvex {
@@ -47,9 +47,9 @@ class StoreLock {
   static Result<StoreLock> take(const std::string& lockPath, bool wait, const std::atomic<bool>& cancelled);
 
  private:
-  explicit StoreLock(ScopedFd fd) : fd_(std::move(fd)) {}
+  explicit StoreLock(FileDescriptor fd) : fd_(std::move(fd)) {}
 
-  ScopedFd fd_;
+  FileDescriptor fd_;
 };
 
 // "/home/" and "/home" are one volume.

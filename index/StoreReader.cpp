@@ -59,7 +59,7 @@ Result<std::unique_ptr<StoreReader>> StoreReader::open(const StoreFolder& folder
   if (const auto checked = reader->checkFile(check); !checked) return checked.error();
   if (reader->isOlder_) return openEmpty(root);
   for (const auto step : {&StoreReader::harden, &StoreReader::checkSchema, &StoreReader::readFacts,
-                          &StoreReader::makeStatements}) {
+                          &StoreReader::makeStatements, &StoreReader::registerFunctions}) {
     if (const auto done = (reader.get()->*step)(); !done) return done.error();
   }
   if (reader->root_ != root) return damagedStore("it is of another volume");
@@ -68,7 +68,6 @@ Result<std::unique_ptr<StoreReader>> StoreReader::open(const StoreFolder& folder
   if (mounted.value() != reader->fileSystem_) {
     return Error{kStoreMissing, "another file system is mounted there than the one that was indexed"};
   }
-  reader->registerPathFunction();
   return reader;
 }
 
@@ -88,7 +87,7 @@ Result<std::unique_ptr<StoreReader>> StoreReader::openEmpty(const std::string& r
   reader->root_ = root;
   reader->mostWork_ = kWorkUnits;
   if (const auto made = reader->makeStatements(); !made) return made.error();
-  reader->registerPathFunction();
+  if (const auto made = reader->registerFunctions(); !made) return made.error();
   return reader;
 }
 
@@ -131,7 +130,7 @@ Result<void> StoreReader::harden() {
   sqlite3_limit(connection, SQLITE_LIMIT_ATTACHED, 0);
   const auto count = [](void* reader) { return static_cast<StoreReader*>(reader)->countWork(); };
   sqlite3_progress_handler(connection, kInstructionsPerUnit, count, this);
-  workLeft_ = mostWork_;
+  allowWork(kAllWork);
   return database_.run(
       "PRAGMA cell_size_check=ON; PRAGMA mmap_size=0; PRAGMA query_only=ON; PRAGMA cache_size=-2048");
 }
@@ -211,8 +210,12 @@ Result<void> StoreReader::makeStatements() {
 }
 
 Result<StoreStatement> StoreReader::prepare(std::string_view sql) {
-  workLeft_ = mostWork_;
+  allowWork(kAllWork);
   return database_.prepare(sql);
+}
+
+void StoreReader::allowWork(std::int64_t units) {
+  workAllowed_ = workLeft_ = std::min(units, mostWork_);
 }
 
 std::optional<StoreCounts> StoreReader::counts() const {

@@ -83,9 +83,18 @@ class StoreReader {
   // The names of the attributes that the item carries besides those that every item has.
   Result<std::vector<std::string>> carriedAttributes(std::int64_t id);
 
-  // A statement over the tables of StoreSchema.h. All that is run until the next call shares one bound on its
-  // work; a store that would take more of it is damaged.
+  // A statement over the tables of StoreSchema.h, which may also use path_of() and what predicates need
+  // (PredicateFunctions.h). All that is run until the next call shares one bound on its work; a store that
+  // would take more of it is damaged.
   Result<StoreStatement> prepare(std::string_view sql);
+
+  // Bounds what is run from now on to so much work, in thousands of SQLite's instructions, and at most to
+  // what an honest store may take. A statement that would take more fails.
+  static constexpr std::int64_t kAllWork = INT64_MAX;
+  void allowWork(std::int64_t units);
+  std::int64_t workDone() const { return workAllowed_ - workLeft_; }  // since then
+  bool isWorkUsedUp() const { return workLeft_ < 0; }
+
   Error lastError() const { return database_.lastError(); }
   sqlite3* connection() const { return database_.handle(); }
 
@@ -98,7 +107,7 @@ class StoreReader {
   Result<void> checkSchema();
   Result<void> readFacts();
   Result<void> makeStatements();
-  void registerPathFunction();
+  Result<void> registerFunctions();
   Result<std::optional<std::int64_t>> childNamed(std::int64_t folder, std::string_view name);
   Result<std::optional<std::int64_t>> searchSorted(std::int64_t folder, std::int64_t first,
                                                    std::int64_t count, std::string_view name);
@@ -117,7 +126,8 @@ class StoreReader {
   StoreCounts counts_;
   AccumulatedSizes::Values accumulatedSizes_{};
   bool isOlder_ = false;
-  std::int64_t workLeft_ = 0, mostWork_ = 0;  // thousands of SQLite's instructions
+  // In thousands of SQLite's instructions.
+  std::int64_t workAllowed_ = 0, workLeft_ = 0, mostWork_ = 0;
   StoreStatement itemById_, folderById_, childByName_, carriedByName_;
   std::map<std::int64_t, StoredType> types_;
 

@@ -3,6 +3,7 @@
 #include <iterator>
 #include <utility>
 
+#include "index/PredicateFunctions.h"
 #include "index/StoreReader.h"
 #include "platform/Utf8.h"
 
@@ -76,9 +77,12 @@ void pathOfItem(sqlite3_context* context, int, sqlite3_value** arguments) {
 
 }  // namespace
 
-void StoreReader::registerPathFunction() {
-  sqlite3_create_function_v2(database_.handle(), "path_of", 1, SQLITE_UTF8 | SQLITE_DIRECTONLY, this,
-                             pathOfItem, nullptr, nullptr, nullptr);
+Result<void> StoreReader::registerFunctions() {
+  if (sqlite3_create_function_v2(database_.handle(), "path_of", 1, SQLITE_UTF8 | SQLITE_DIRECTONLY, this,
+                                 pathOfItem, nullptr, nullptr, nullptr) != SQLITE_OK) {
+    return lastError();
+  }
+  return registerPredicateFunctions(database_.handle());
 }
 
 Result<StoredItem> StoreReader::item(std::int64_t id) {
@@ -153,7 +157,7 @@ Result<std::optional<std::int64_t>> StoreReader::itemAt(std::string_view path) {
 }
 
 Result<std::optional<std::int64_t>> StoreReader::childNamed(std::int64_t folder, std::string_view name) {
-  workLeft_ = mostWork_;
+  allowWork(kAllWork);
   std::int64_t first = 0, count = 0, state = 0;
   {
     const Running running(folderById_);
@@ -228,7 +232,7 @@ Result<const StoredType*> StoreReader::typeOf(std::int64_t type) {
 }
 
 Result<std::optional<MetadataValue>> StoreReader::attribute(std::int64_t id, std::string_view name) {
-  workLeft_ = mostWork_;
+  allowWork(kAllWork);
   auto found = item(id);
   if (!found) return found.error();
   using Value = std::optional<MetadataValue>;

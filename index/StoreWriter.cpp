@@ -9,9 +9,9 @@
 #include <utility>
 #include <variant>
 
-#include "index/ScopedFd.h"
 #include "index/SparseAttributes.h"
 #include "index/StoreSeal.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Utf8.h"
 
 namespace norvex {
@@ -98,7 +98,7 @@ StoreWriter::StoreWriter(std::string path, StoreDatabase database, const std::at
 Result<StoreWriter> StoreWriter::create(const std::string& path, const std::atomic<bool>& cancelled) {
   if (::unlink(path.c_str()) != 0 && errno != ENOENT) return systemError(errno);
   // Made here and not by SQLite, so that it is the user's alone from its first moment.
-  if (!ScopedFd(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600))) {
+  if (!FileDescriptor(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600))) {
     return systemError(errno);
   }
   auto database = StoreDatabase::open(path, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX);
@@ -119,7 +119,6 @@ Result<void> StoreWriter::begin() {
     if (auto made = database_->run(object.sql); !made) return made;
   }
   const std::pair<StoreStatement*, const char*> statements[] = {
-      {&insertItem_, "INSERT INTO items VALUES(?,?,?,?,?,?)"},
       {&insertFolder_, "INSERT INTO folders VALUES(?,?,?,?)"},
       {&insertAttribute_, "INSERT OR REPLACE INTO attributes VALUES(?,?,?)"},
       {&insertFact_, "INSERT INTO facts VALUES(?,?)"},
@@ -133,29 +132,24 @@ Result<void> StoreWriter::begin() {
     if (!prepared) return prepared.error();
     *statement = std::move(prepared).value();
   }
+  auto items = StoreItemInserter::prepare(*database_);
+  if (!items) return items.error();
+  items_ = std::move(items).value();
   return {};
 }
 
+// The first failure is kept: the others follow from it.
+void StoreWriter::note(bool isDone) {
+  if (!isDone && !failure_) failure_ = database_->lastError();
+}
+
 void StoreWriter::step(sqlite3_stmt* statement) {
-  if (sqlite3_step(statement) != SQLITE_DONE && !failure_) failure_ = database_->lastError();
+  note(sqlite3_step(statement) == SQLITE_DONE);
   sqlite3_reset(statement);
 }
 
 std::int64_t StoreWriter::add(const StoreItem& item) {
-  sqlite3_stmt* statement = insertItem_.get();
-  sqlite3_bind_int64(statement, 1, nextId_);
-  sqlite3_bind_int64(statement, 2, item.parent);
-  // An empty view may have no address, which would be bound as NULL.
-  sqlite3_bind_blob(statement, 3, item.name.empty() ? "" : item.name.data(),
-                    static_cast<int>(item.name.size()), SQLITE_STATIC);
-  sqlite3_bind_int64(statement, 4, item.type);
-  if (item.size) {
-    sqlite3_bind_int64(statement, 5, *item.size);
-  } else {
-    sqlite3_bind_null(statement, 5);
-  }
-  sqlite3_bind_int64(statement, 6, item.mtime);
-  step(statement);
+  note(items_->add(item));
   if (item.type >= usedTypes_.size()) usedTypes_.resize(std::size_t{item.type} + 1);
   usedTypes_[item.type] = true;
   return nextId_++;
@@ -200,6 +194,7 @@ std::int64_t StoreWriter::attributeNameId(std::string_view name) {
 Result<std::vector<StoreSubfolder>> StoreWriter::pendingFolders(std::int64_t first, std::int64_t end,
                                                                 std::size_t most,
                                                                 const std::vector<bool>& isFolderType) {
+  if (!items_->flush()) return database_->lastError();
   std::vector<StoreSubfolder> folders;
   sqlite3_stmt* statement = listPending_.get();
   sqlite3_bind_int64(statement, 1, first);
@@ -257,6 +252,7 @@ void StoreWriter::setFact(std::string_view name, std::int64_t number) {
 }
 
 Result<void> StoreWriter::writeFacts(const StoreVolumeFacts& facts) {
+  note(items_->flush());
   setFact(kFactRoot, facts.root);
   setFact(kFactFileSystem, facts.fileSystem);
   setFact(kFactFiles, static_cast<std::int64_t>(facts.files));
@@ -300,14 +296,15 @@ Result<void> StoreWriter::checkCounts(std::uint64_t items) {
 }
 
 Result<void> StoreWriter::closeAndSeal() {
-  for (StoreStatement* statement : {&insertItem_, &insertFolder_, &insertAttribute_, &insertFact_,
-                                    &insertName_, &findName_, &listPending_}) {
+  items_.reset();
+  for (StoreStatement* statement :
+       {&insertFolder_, &insertAttribute_, &insertFact_, &insertName_, &findName_, &listPending_}) {
     statement->reset();
   }
   database_.reset();
-  const ScopedFd file(::open(path_.c_str(), O_RDWR | O_CLOEXEC | O_NOFOLLOW));
+  const FileDescriptor file(::open(path_.c_str(), O_RDWR | O_CLOEXEC | O_NOFOLLOW));
   if (!file) return systemError(errno);
-  return sealStore(file.get());
+  return sealStore(file.number());
 }
 
 Result<void> StoreWriter::finish(const StoreVolumeFacts& facts, std::int64_t healthCheckTime) {

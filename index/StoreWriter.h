@@ -16,18 +16,12 @@
 #include "index/AccumulatedSizes.h"
 #include "index/ContentTypes.h"
 #include "index/StoreDatabase.h"
+#include "index/StoreItem.h"
+#include "index/StoreItemInserter.h"
 #include "index/StoreSchema.h"
 #include "platform/Result.h"
 
 namespace norvex {
-
-struct StoreItem {
-  std::int64_t parent = 0;
-  std::string_view name;
-  TypeId type = 0;
-  std::optional<std::int64_t> size;  // bytes; none for folders
-  std::int64_t mtime = 0;            // nanoseconds since 1970
-};
 
 struct StoreVolumeFacts {
   std::string root;
@@ -94,11 +88,12 @@ class StoreWriter {
   void setFact(std::string_view name, std::string_view text);
   void setFact(std::string_view name, std::int64_t number);
   void step(sqlite3_stmt* statement);
+  void note(bool isDone);
 
   std::string path_;
   std::optional<StoreDatabase> database_;
-  StoreStatement insertItem_, insertFolder_, insertAttribute_, insertFact_, insertName_, findName_,
-      listPending_;
+  std::optional<StoreItemInserter> items_;
+  StoreStatement insertFolder_, insertAttribute_, insertFact_, insertName_, findName_, listPending_;
   std::unordered_map<std::string, std::int64_t> nameIds_;
   std::vector<bool> usedTypes_;
   std::int64_t nextId_ = kRootItem;

@@ -1,26 +1,20 @@
 #include "index/StoredQuery.h"
 
-#include <sqlite3.h>
-
 #include <atomic>
 #include <utility>
 
 #include "index/FinishObservers.h"
-#include "index/PredicateFunctions.h"
 #include "index/PredicateParser.h"
 #include "index/PredicateSql.h"
+#include "index/StoreSearch.h"
 
 namespace norvex {
 namespace {
 
-// Few enough that the loop comes to its other inputs soon, many enough that the turns of the loop cost
-// nothing.
-constexpr int kRowsPerBatch = 4096;
-
-// The matches in one store: what is still to be stepped through, and what has been found.
+// The matches in one store: what is still to be searched, and what has been found.
 struct StoreMatches {
   StoreReader* store;
-  StoreStatement rows;  // nullptr once all have been found
+  StoreSearch search;
   std::vector<std::int64_t> items;
 };
 
@@ -33,22 +27,6 @@ struct Gathering {
   FinishObservers observers;
   std::atomic<bool> stopped{false};
 };
-
-// Takes up to a batch of rows. False when there are no more.
-bool gatherBatch(Gathering& gathering, StoreMatches& found) {
-  for (int row = 0; row < kRowsPerBatch; ++row) {
-    const int status = sqlite3_step(found.rows.get());
-    if (status == SQLITE_ROW) {
-      found.items.push_back(sqlite3_column_int64(found.rows.get(), 0));
-      continue;
-    }
-    // What has been found so far stands; the next query over this store does not start.
-    if (status != SQLITE_DONE) gathering.stores.giveUp(*found.store, found.store->lastError());
-    found.rows.reset();
-    return false;
-  }
-  return true;
-}
 
 class StoredQuery final : public MetadataQuery {
  public:
@@ -102,19 +80,21 @@ bool StoredQuery::start() {
 bool StoredQuery::addScope(const Location& scope, const PredicateSql& sql) {
   const auto store = gathering_->stores.storeOf(normalizedPath(scope.path()));
   if (!store.ok()) return store.error().code == kStoreMissing;
-  auto rows = store.value()->prepare("SELECT i.id FROM items AS i WHERE " + sql.where + " ORDER BY i.id");
-  if (!rows.ok() || !bindPredicateValues(rows.value().get(), sql).ok()) return false;
-  gathering_->matches.push_back({store.value(), std::move(rows).value(), {}});
+  auto search = StoreSearch::begin(*store.value(), sql);
+  if (!search.ok()) return false;
+  gathering_->matches.push_back({store.value(), std::move(search).value(), {}});
   return true;
 }
 
-// Queues the next batch; the last one queues the end of the gathering on the main loop.
+// Queues the next piece of the search; the last one queues the end of the gathering on the main loop.
 void StoredQuery::gather() {
   startingLoop_->post([this, gathering = gathering_] {
     if (gathering->stopped.load(std::memory_order_acquire)) return;  // `this` may be gone
     for (StoreMatches& found : gathering->matches) {
-      if (found.rows == nullptr) continue;
-      gatherBatch(*gathering, found);
+      if (found.search.isDone()) continue;
+      // What has been found so far stands; the next query over a store that fails does not start.
+      const auto more = found.search.findMore(found.items);
+      if (!more.ok()) gathering->stores.giveUp(*found.store, more.error());
       return gather();
     }
     // Whoever drops a query before its end has removed his observers, and nobody is told.

@@ -1,6 +1,6 @@
 // A query over the stores of volumes.
 //
-// Gathers the numbers of matching items, 8 bytes a match, in batches that are inputs of the starting thread's
+// Gathers the numbers of matching items, 8 bytes a match, piece by piece as inputs of the starting thread's
 // loop; what a match says of itself is read from the store when it is asked for. Thread rules:
 // platform/MetadataIndex.h.
 #pragma once

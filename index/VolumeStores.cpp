@@ -4,8 +4,6 @@
 
 #include <algorithm>
 
-#include "index/PredicateFunctions.h"
-
 namespace norvex {
 
 bool hasStoreFile(const StoreFolder& folder, const std::string& volumeRoot) {
@@ -30,9 +28,6 @@ Result<StoreReader*> VolumeStores::storeOf(const std::string& volumeRoot) {
     auto store = StoreReader::open(folder_, place->first);
     if (!store.ok()) {
       opened.error = store.error();
-    } else if (const auto prepared = registerPredicateFunctions(store.value()->connection());
-               !prepared.ok()) {
-      opened.error = prepared.error();
     } else {
       opened.store = std::move(store).value();
     }

@@ -4,6 +4,7 @@
 #include <array>
 #include <cerrno>
 #include <chrono>
+#include <iterator>
 #include <string_view>
 
 #include "platform/Platform.h"
@@ -320,6 +321,7 @@ constexpr VolumeQuery volumeQueries[] = {
      "kMDItemKind == 'Virtual Disk Image'",
      virtualMachineCounters, handleAnyItem},
 };
+static_assert(std::size(volumeQueries) == NVXScanner::queriesPerVolume);
 
 // Runs the seven queries over a volume. False when one does not start.
 bool runQueries(NVXScanner& scanner, NVXScannerResults& results, const Location& volume, bool isStartupDisk) {

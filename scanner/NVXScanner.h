@@ -5,6 +5,7 @@
 // all figures are unsigned 64-bit and sums wrap.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <functional>
 #include <memory>
@@ -38,6 +39,9 @@ class NVXScanner {
   // Measures everything and returns the record, which the caller owns. Nothing when a volume's index has no
   // health check yet, or when a query does not start; nothing has been reported then.
   std::unique_ptr<NVXScannerResults> scan();
+
+  // How many queries a scan makes of each volume; a measure of how far it has come.
+  static constexpr std::size_t queriesPerVolume = 7;
 
   // --- metadata queries
 

@@ -1,116 +1,131 @@
 #include "tool/CommandLine.h"
 
 #include <CLI/CLI.hpp>
+#include <functional>
 #include <memory>
 #include <string>
+#include <utility>
+#include <vector>
+
+#include "tool/HelpTexts.h"
 
 namespace norvex {
 namespace {
 
 constexpr const char* kProgramName = "norvexctl";
 
-constexpr const char* kProgramFooter =
-    "Example:\n"
-    "  norvexctl index update && norvexctl index status\n"
-    "\n"
-    "Exit status: 0 done, 1 something could not be done, 2 the command line makes no sense.";
-
-constexpr const char* kUpdateFooter =
-    "Without VOLUME: the included volumes of the backup settings (chronel/backup.conf).\n"
-    "Ctrl-C leaves every index as it was.\n"
-    "\n"
-    "Example:\n"
-    "  norvexctl index update / /home";
-
-constexpr const char* kStatusFooter =
-    "Without VOLUME: the included volumes of the backup settings.\n"
-    "\n"
-    "Example:\n"
-    "  norvexctl index status /";
-
-constexpr const char* kQueryFooter =
-    "Without --volume: the included volumes that have an index.\n"
-    "\n"
-    "A predicate compares attributes (== != < <= > >=, InRange(attribute, low, high), attribute == *),\n"
-    "joined by && || ! and parentheses. In a string, * stands for anything; behind it, c ignores case\n"
-    "and d diacritics. `norvexctl index show PATH` names the attributes of an item.\n"
-    "\n"
-    "Examples:\n"
-    "  norvexctl index query 'kMDItemFSName == \"*.iso\"c && kMDItemFSSize > 1000000000'\n"
-    "  norvexctl index query --null 'kMDItemContentTypeTree == \"public.image\"' | xargs -0 ls -l";
-
-constexpr const char* kShowFooter =
-    "Example:\n"
-    "  norvexctl index show ~/Downloads";
-
-constexpr const char* kJsonHelp = "Write one JSON document (docs/norvexctl-json.md)";
-
 // The commands and where their arguments go. Outlives the parsing.
-struct Grammar {
-  CLI::App program{"Shows how the storage of this machine is used.", kProgramName};
-  IndexUpdateRequest updateRequest;
-  IndexStatusRequest statusRequest;
-  IndexQueryRequest queryRequest;
-  IndexShowRequest showRequest;
-  CLI::App* update = nullptr;
-  CLI::App* status = nullptr;
-  CLI::App* query = nullptr;
-  CLI::App* show = nullptr;
+class Grammar {
+ public:
+  CLI::App program{"Shows how the storage of this machine is used, and what is reported of it.",
+                   kProgramName};
 
   Grammar() {
-    program.footer(kProgramFooter);
+    program.footer(help::kProgram);
     program.require_subcommand(1);
     CLI::App* index = program.add_subcommand("index", "The metadata index of whole volumes");
     index->require_subcommand(1);
-    index->footer(kProgramFooter);
-    addUpdate(*index);
-    addStatus(*index);
-    addQuery(*index);
-    addShow(*index);
+    index->footer(help::kIndex);
+    addIndexUpdate(*index);
+    addIndexStatus(*index);
+    addIndexQuery(*index);
+    addIndexShow(*index);
+    addPreview();
+    addSummary();
+    addShow();
+    addLog();
   }
 
-  void addUpdate(CLI::App& index) {
-    update = index.add_subcommand("update", "Make the indexes of volumes anew");
-    update->footer(kUpdateFooter);
-    update->add_option("VOLUME", updateRequest.volumes, "Mount points of volumes")->type_name("");
-    update->add_flag("--json", updateRequest.json, kJsonHelp);
+  // The command that was parsed, with its arguments.
+  CommandRequest request() const {
+    for (const auto& [app, request] : commands_) {
+      if (app->parsed()) return request();
+    }
+    return {};  // the program requires one
   }
 
-  void addStatus(CLI::App& index) {
-    status = index.add_subcommand("status", "Show what the indexes say of volumes");
-    status->footer(kStatusFooter);
-    status->add_option("VOLUME", statusRequest.volumes, "Mount points of volumes")->type_name("");
-    status->add_flag("--json", statusRequest.json, kJsonHelp);
+ private:
+  // The parser's command and where its arguments go.
+  template <typename Request>
+  struct Command {
+    CLI::App& app;
+    Request& request;
+  };
+
+  // Every command can write JSON.
+  template <typename Request>
+  Command<Request> add(CLI::App& parent, const char* name, const char* description, const char* footer) {
+    const auto request = std::make_shared<Request>();
+    CLI::App* app = parent.add_subcommand(name, description);
+    app->footer(footer);
+    app->add_flag("--json", request->json, "Write one JSON document (docs/norvexctl-json.md)");
+    commands_.emplace_back(app, [request] { return CommandRequest(*request); });
+    return {*app, *request};
   }
 
-  void addQuery(CLI::App& index) {
-    query = index.add_subcommand("query", "List the items that match a predicate");
-    query->footer(kQueryFooter);
-    query->add_option("PREDICATE", queryRequest.predicate, "What to look for")->required()->type_name("");
-    query->add_option("--volume", queryRequest.volumes, "Look on this volume; may be given several times")
+  void addIndexUpdate(CLI::App& index) {
+    const auto [app, request] =
+        add<IndexUpdateRequest>(index, "update", "Make the indexes of volumes anew", help::kIndexUpdate);
+    app.add_option("VOLUME", request.volumes, "Mount points of volumes")->type_name("");
+  }
+
+  void addIndexStatus(CLI::App& index) {
+    const auto [app, request] =
+        add<IndexStatusRequest>(index, "status", "Show what the indexes say of volumes", help::kIndexStatus);
+    app.add_option("VOLUME", request.volumes, "Mount points of volumes")->type_name("");
+  }
+
+  void addIndexQuery(CLI::App& index) {
+    const auto [app, request] =
+        add<IndexQueryRequest>(index, "query", "List the items that match a predicate", help::kIndexQuery);
+    app.add_option("PREDICATE", request.predicate, "What to look for")->required()->type_name("");
+    app.add_option("--volume", request.volumes, "Look on this volume; may be given several times")
         ->type_name("VOLUME")
         ->expected(1)
         ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll);
-    CLI::Option* count = query->add_flag("--count", queryRequest.countOnly, "Write only how many match");
+    CLI::Option* count = app.add_flag("--count", request.countOnly, "Write only how many match");
     CLI::Option* null =
-        query->add_flag("-0,--null", queryRequest.nullSeparated, "End each path with a NUL, for xargs -0");
-    CLI::Option* json = query->add_flag("--json", queryRequest.json, kJsonHelp);
-    null->excludes(count)->excludes(json);
+        app.add_flag("-0,--null", request.nullSeparated, "End each path with a NUL, for xargs -0");
+    null->excludes(count)->excludes(app.get_option("--json"));
   }
 
-  void addShow(CLI::App& index) {
-    show = index.add_subcommand("show", "Show all attributes of an item");
-    show->footer(kShowFooter);
-    show->add_option("PATH", showRequest.path, "The item's path")->required()->type_name("");
-    show->add_flag("--json", showRequest.json, kJsonHelp);
+  void addIndexShow(CLI::App& index) {
+    const auto [app, request] =
+        add<IndexShowRequest>(index, "show", "Show all attributes of an item", help::kIndexShow);
+    app.add_option("PATH", request.path, "The item's path")->required()->type_name("");
   }
 
-  CommandRequest request() const {
-    if (update->parsed()) return updateRequest;
-    if (status->parsed()) return statusRequest;
-    if (query->parsed()) return queryRequest;
-    return showRequest;
+  // What every command that measures has.
+  template <typename Request>
+  static void addNoIndex(const Command<Request>& command) {
+    command.app.add_flag("!--no-index", command.request.updateIndex,
+                         "Measure with the index as it is, instead of updating it first");
   }
+
+  void addPreview() {
+    addNoIndex(add<PreviewRequest>(program, "preview", "Show what would be reported", help::kPreview));
+  }
+
+  void addSummary() {
+    addNoIndex(add<SummaryRequest>(program, "summary", "Show every figure exactly", help::kSummary));
+  }
+
+  void addShow() {
+    const auto command = add<ShowRequest>(program, "show", "Show where the space went", help::kShow);
+    addNoIndex(command);
+    command.app.add_option("--html", command.request.htmlFile, "Write a page for the browser into this file")
+        ->type_name("FILE")
+        ->excludes(command.app.get_option("--json"));
+  }
+
+  void addLog() {
+    const auto [app, request] = add<LogRequest>(program, "log", "Show what has been reported", help::kLog);
+    app.add_option("--since", request.since, "Only from this moment on")->type_name("MOMENT");
+    app.add_option("--domain", request.domain, "Only messages of this domain, or ending so, such as run2")
+        ->type_name("DOMAIN");
+  }
+
+  std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;
 };
 
 }  // namespace

@@ -11,12 +11,17 @@
 #include "tool/IndexShowCommand.h"
 #include "tool/IndexStatusCommand.h"
 #include "tool/IndexUpdateCommand.h"
+#include "tool/LogCommand.h"
+#include "tool/PreviewCommand.h"
+#include "tool/ShowCommand.h"
+#include "tool/SummaryCommand.h"
 
 namespace norvex {
 
 // One alternative a command.
 using CommandRequest =
-    std::variant<IndexUpdateRequest, IndexStatusRequest, IndexQueryRequest, IndexShowRequest>;
+    std::variant<IndexUpdateRequest, IndexStatusRequest, IndexQueryRequest, IndexShowRequest, PreviewRequest,
+                 SummaryRequest, ShowRequest, LogRequest>;
 
 // The command that was asked for; or the status to end with when nothing is left to do, because help was
 // asked for and written to `out`, or because `err` has been told what makes no sense.

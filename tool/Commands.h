@@ -14,6 +14,10 @@ struct CommandRunner {
   ExitStatus operator()(const IndexStatusRequest& request) const { return runIndexStatus(world, request); }
   ExitStatus operator()(const IndexQueryRequest& request) const { return runIndexQuery(world, request); }
   ExitStatus operator()(const IndexShowRequest& request) const { return runIndexShow(world, request); }
+  ExitStatus operator()(const LogRequest& request) const { return runLog(world, request); }
+  ExitStatus operator()(const PreviewRequest& request) const { return runPreview(world, request); }
+  ExitStatus operator()(const ShowRequest& request) const { return runShow(world, request); }
+  ExitStatus operator()(const SummaryRequest& request) const { return runSummary(world, request); }
 };
 
 inline ExitStatus runCommand(ToolWorld& world, const CommandRequest& request) {

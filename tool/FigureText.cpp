@@ -69,8 +69,8 @@ std::string secondsText(std::chrono::duration<double> elapsed) {
   return text.data();
 }
 
-std::string countText(std::uint64_t count, const std::string& thing) {
-  return std::to_string(count) + " " + thing + (count == 1 ? "" : "s");
+std::string countText(const DigitsText& digits, std::uint64_t count, const std::string& thing) {
+  return digits(count) + " " + thing + (count == 1 ? "" : "s");
 }
 
 }  // namespace norvex

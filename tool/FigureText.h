@@ -5,6 +5,7 @@
 
 #include <chrono>
 #include <cstdint>
+#include <functional>
 #include <string>
 
 namespace norvex {
@@ -24,7 +25,10 @@ std::string elapsedText(std::chrono::duration<double> elapsed);
 // "12.3"
 std::string secondsText(std::chrono::duration<double> elapsed);
 
-// "1 folder", "2 folders"; `thing` is the singular.
-std::string countText(std::uint64_t count, const std::string& thing);
+// A whole number with the user's grouping of its digits.
+using DigitsText = std::function<std::string(std::uint64_t)>;
+
+// "1 folder", "2,000 folders"; `thing` is the singular.
+std::string countText(const DigitsText& digits, std::uint64_t count, const std::string& thing);
 
 }  // namespace norvex

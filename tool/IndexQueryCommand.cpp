@@ -1,13 +1,11 @@
 #include "tool/IndexQueryCommand.h"
 
-#include <sqlite3.h>
-
 #include <algorithm>
 #include <utility>
 
-#include "index/PredicateFunctions.h"
 #include "index/PredicateParser.h"
 #include "index/PredicateSql.h"
+#include "index/StoreSearch.h"
 #include "tool/Faults.h"
 #include "tool/JsonText.h"
 #include "tool/PredicateErrorText.h"
@@ -58,24 +56,22 @@ class MatchWriter {
 };
 
 Result<void> writeMatches(StoreReader& store, const PredicateSql& sql, bool countOnly, MatchWriter& writer) {
-  if (const auto known = registerPredicateFunctions(store.connection()); !known) return known.error();
-  auto statement =
-      store.prepare(countOnly ? "SELECT count(*) FROM items AS i WHERE " + sql.where
-                              : "SELECT i.id FROM items AS i WHERE " + sql.where + " ORDER BY i.id");
-  if (!statement) return statement.error();
-  sqlite3_stmt* rows = statement.value().get();
-  if (const auto bound = bindPredicateValues(rows, sql); !bound) return bound.error();
-  int status = SQLITE_ROW;
-  while ((status = sqlite3_step(rows)) == SQLITE_ROW) {
+  auto search = StoreSearch::begin(store, sql);
+  if (!search) return search.error();
+  std::vector<std::int64_t> items;
+  while (!search.value().isDone()) {
+    items.clear();
+    if (const auto found = search.value().findMore(items); !found) return found.error();
     if (countOnly) {
-      writer.addCount(static_cast<std::uint64_t>(sqlite3_column_int64(rows, 0)));
+      writer.addCount(items.size());
       continue;
     }
-    const auto path = store.pathOf(sqlite3_column_int64(rows, 0));
-    if (!path) return path.error();
-    writer.add(path.value());
+    for (const std::int64_t item : items) {
+      const auto path = store.pathOf(item);
+      if (!path) return path.error();
+      writer.add(path.value());
+    }
   }
-  if (status != SQLITE_DONE) return store.lastError();
   return {};
 }
 

@@ -8,8 +8,21 @@ namespace {
 std::atomic<bool> wanted{false};
 static_assert(std::atomic<bool>::is_always_lock_free, "a signal handler may set nothing else");
 
+constexpr int kSignals[] = {SIGINT, SIGTERM, SIGHUP};
+
 void noteStop(int) {
   wanted.store(true);
+}
+
+// What was ignored when the program started stays so: `nohup` means it.
+void setUnlessIgnored(int signal, void (*handler)(int), int flags) {
+  struct sigaction before {};
+  ::sigaction(signal, nullptr, &before);
+  if (before.sa_handler == SIG_IGN) return;
+  struct sigaction action {};
+  action.sa_handler = handler;
+  action.sa_flags = flags;
+  ::sigaction(signal, &action, nullptr);
 }
 
 }  // namespace
@@ -18,16 +31,13 @@ const std::atomic<bool>& stopWanted() {
   return wanted;
 }
 
-void takeStopSignals() {
-  struct sigaction action {};
-  action.sa_handler = noteStop;
-  action.sa_flags = static_cast<int>(SA_RESETHAND | SA_RESTART);
-  for (const int signal : {SIGINT, SIGTERM, SIGHUP}) {
-    // What was ignored when the program started stays so: `nohup` means it.
-    struct sigaction before {};
-    ::sigaction(signal, nullptr, &before);
-    if (before.sa_handler != SIG_IGN) ::sigaction(signal, &action, nullptr);
-  }
+StopSignals::StopSignals() {
+  for (const int signal : kSignals)
+    setUnlessIgnored(signal, noteStop, static_cast<int>(SA_RESETHAND | SA_RESTART));
+}
+
+StopSignals::~StopSignals() {
+  for (const int signal : kSignals) setUnlessIgnored(signal, SIG_DFL, 0);
 }
 
 }  // namespace norvex

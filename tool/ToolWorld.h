@@ -12,7 +12,9 @@
 #include "platform/BackupSettings.h"
 #include "platform/ByteCountFormatter.h"
 #include "platform/Clock.h"
+#include "tool/AgentJournal.h"
 #include "tool/Console.h"
+#include "tool/FigureText.h"
 
 namespace norvex {
 
@@ -23,13 +25,16 @@ struct ToolWorld {
   const StoreFolder& stores;
   BackupSettings& backupSettings;
   const ByteCountFormatter& byteCounts;
+  DigitsText digits;   // of counts
   const Clock& clock;  // for elapsed times
 
   std::function<std::int64_t()> secondsSince1970;                // the present moment, for people
   std::function<bool(const std::string& path)> isMountPoint;     // whether another volume begins there
   std::function<std::string(const std::string& path)> absolute;  // of a path as it was written
 
-  std::string dataHome;  // the user's data folder
+  std::string dataHome;      // the user's data folder
+  std::string messagesFile;  // of the diagnostic log, for when there is no journal
+  AgentJournal& agentJournal;
 
   // Set once the user wants to stop; read by what may take long.
   const std::atomic<bool>& cancelled;

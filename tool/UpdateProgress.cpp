@@ -8,8 +8,6 @@
 namespace norvex {
 namespace {
 
-constexpr std::string_view kEraseLine = "\r\x1b[2K";
-
 std::uint64_t sumOf(const AccumulatedSizes& sizes) {
   // 18 numbers below 2^63 could pass 2^64: then the line is wrong for a moment, and nothing else.
   return std::accumulate(
@@ -19,41 +17,25 @@ std::uint64_t sumOf(const AccumulatedSizes& sizes) {
 
 }  // namespace
 
-std::uint64_t perSecond(std::uint64_t count, std::chrono::duration<double> elapsed) {
-  return elapsed.count() > 0 ? static_cast<std::uint64_t>(static_cast<double>(count) / elapsed.count()) : 0;
-}
-
-UpdateProgress::UpdateProgress(Console& console, const Clock& clock, const ByteCountFormatter& byteCounts,
-                               const std::string& volume)
-    : console_(console),
-      clock_(clock),
-      byteCounts_(byteCounts),
-      volume_(volume),
-      started_(clock.now()),
-      lastShown_(started_) {
-  if (console_.style().isTerminal) write({}, started_);
-}
-
-UpdateProgress::~UpdateProgress() {
-  if (console_.style().isTerminal) console_.stream() << kEraseLine << std::flush;
+UpdateProgress::UpdateProgress(ToolWorld& world, const std::string& volume, std::uint64_t expectedItems)
+    : world_(world), volume_(volume), expectedItems_(expectedItems), line_(world.err, world.clock) {
+  write({});
 }
 
 void UpdateProgress::show(const CrawlFigures& figures) {
-  if (!console_.style().isTerminal) return;
-  const Clock::Moment now = clock_.now();
-  if (now - lastShown_ < kInterval) return;
-  lastShown_ = now;
-  write(figures, now);
+  if (line_.isDue()) write(figures);
 }
 
-void UpdateProgress::write(const CrawlFigures& figures, Clock::Moment now) {
-  const auto elapsed = now - started_;
-  const std::string line = safeText(volume_) + "  " + elapsedText(elapsed) + "  " +
-                           countText(figures.files, "file") + ", " + countText(figures.folders, "folder") +
-                           ", " + byteCounts_.string(sumOf(figures.accumulatedSizes)) + ", " +
-                           std::to_string(perSecond(figures.files + figures.folders, elapsed)) + " items/s";
-  // The last column stays free: some terminals go to the next line once it is filled.
-  console_.stream() << std::string(kEraseLine) + fittingText(line, console_.style().width - 1) << std::flush;
+void UpdateProgress::write(const CrawlFigures& figures) {
+  const auto elapsed = line_.elapsed();
+  const std::uint64_t items = figures.files + figures.folders;
+  const double done =
+      expectedItems_ == 0 ? 0 : static_cast<double>(items) / static_cast<double>(expectedItems_);
+  line_.show(safeText(volume_) + "  " + elapsedText(elapsed) + "  " +
+             countText(world_.digits, figures.files, "file") + ", " +
+             countText(world_.digits, figures.folders, "folder") + ", " +
+             world_.byteCounts.string(sumOf(figures.accumulatedSizes)) + ", " +
+             world_.digits(perSecond(items, elapsed)) + " items/s" + remainingText(done, elapsed));
 }
 
 }  // namespace norvex

@@ -1,46 +1,33 @@
-// The line that shows how far an update has come: one line of a terminal that is written over and over.
+// The line that shows how far an update of an index has come.
 //
 // Made for one volume's update. show() is called by the crawl's thread while the maker waits.
 #pragma once
 
+#include <cstdint>
 #include <string>
 
 #include "index/Crawl.h"
-#include "platform/ByteCountFormatter.h"
-#include "platform/Clock.h"
-#include "tool/Console.h"
+#include "tool/ProgressLine.h"
+#include "tool/ToolWorld.h"
 
 namespace norvex {
 
 class UpdateProgress {
  public:
-  // How often the line changes: often enough to see that something is done, too seldom to slow it down.
-  static constexpr std::chrono::milliseconds kInterval{100};
-
-  // All outlive this object. Writes nothing unless `console` is a terminal.
-  UpdateProgress(Console& console, const Clock& clock, const ByteCountFormatter& byteCounts,
-                 const std::string& volume);
-
-  // Erases the line.
-  ~UpdateProgress();
-  UpdateProgress(const UpdateProgress&) = delete;
-  UpdateProgress& operator=(const UpdateProgress&) = delete;
+  // `expectedItems`: how many there were the last time, 0 when that is not known. Both references outlive
+  // this object.
+  UpdateProgress(ToolWorld& world, const std::string& volume, std::uint64_t expectedItems);
 
   // Writes the line anew when the last one is old enough.
   void show(const CrawlFigures& figures);
 
  private:
-  void write(const CrawlFigures& figures, Clock::Moment now);
+  void write(const CrawlFigures& figures);
 
-  Console& console_;
-  const Clock& clock_;
-  const ByteCountFormatter& byteCounts_;
+  ToolWorld& world_;
   const std::string& volume_;
-  const Clock::Moment started_;
-  Clock::Moment lastShown_;
+  const std::uint64_t expectedItems_;
+  ProgressLine line_;
 };
-
-// Things a second, whole; 0 while no time has passed.
-std::uint64_t perSecond(std::uint64_t count, std::chrono::duration<double> elapsed);
 
 }  // namespace norvex

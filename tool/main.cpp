@@ -11,15 +11,14 @@
 #include <system_error>
 
 #include "index/MountPoints.h"
-#include "platform/linux/ConfBackupSettings.h"
-#include "platform/linux/Environment.h"
+#include "machine/MachinePlatform.h"
+#include "platform/linux/FileDiagnosticLog.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
-#include "platform/linux/SteadyClock.h"
-#include "platform/linux/XdgFolders.h"
 #include "tool/CommandLine.h"
 #include "tool/Commands.h"
 #include "tool/ConsoleSystemLog.h"
 #include "tool/StopSignals.h"
+#include "tool/SystemdAgentJournal.h"
 
 namespace {
 
@@ -39,20 +38,29 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
   const auto parsed = parseCommandLine(argc, argv, std::cout, std::cerr);
   if (const auto* status = std::get_if<ExitStatus>(&parsed)) return *status;
   const auto& request = std::get<CommandRequest>(parsed);
-  // The other commands only read: the signals may end them at any moment.
-  if (std::holds_alternative<IndexUpdateRequest>(request)) takeStopSignals();
-
   const Environment environment = processEnvironment();
-  const XdgFolders folders = XdgFolders::fromEnvironment(environment);
   Console out(std::cout, ConsoleStyle::of(STDOUT_FILENO, environment));
   Console err(std::cerr, ConsoleStyle::of(STDERR_FILENO, environment));
   ConsoleSystemLog log(err);
-  ConfBackupSettings settings({folders.config, "/etc"}, log);
-  const LocaleByteCountFormatter byteCounts;
-  const SteadyClock clock;
-  const StoreFolder stores(folders.cache + "/norvex");
-  ToolWorld world{out,          err,          stores,       settings,    byteCounts, clock, secondsSince1970,
-                  isMountPoint, absolutePath, folders.data, stopWanted()};
+  const MachinePlatform machine(argc, argv, environment, log);
+  const Platform& roles = machine.roles();
+  const ScopedPlatform installed(roles);
+  const LocaleByteCountFormatter numbers;
+  SystemdAgentJournal journal;
+  ToolWorld world{.out = out,
+                  .err = err,
+                  .stores = machine.storeFolder(),
+                  .backupSettings = roles.backupSettings,
+                  .byteCounts = roles.byteCountFormatter,
+                  .digits = [&numbers](std::uint64_t number) { return numbers.grouped(number); },
+                  .clock = roles.clock,
+                  .secondsSince1970 = secondsSince1970,
+                  .isMountPoint = isMountPoint,
+                  .absolute = absolutePath,
+                  .dataHome = machine.folders().data,
+                  .messagesFile = FileDiagnosticLog::pathBelow(machine.folders().state),
+                  .agentJournal = journal,
+                  .cancelled = stopWanted()};
 
   ExitStatus status = runCommand(world, request);
   worsen(status, log.status());

@@ -23,19 +23,19 @@ std::optional<Box> BoxReader::boxAt(std::uint64_t offset, const Box& parent) {
   if (!header) return std::nullopt;
   ++boxesRead_;
 
-  std::uint64_t size = bigEndian(header->substr(0, kSizeLength));
+  std::uint64_t size = bigEndian32(header->data());
   std::size_t headerLength = kHeaderLength;
   if (size == kSizeFollows) {
     if (left < kWideHeaderLength) return std::nullopt;
     headerLength = kWideHeaderLength;
-    size = bigEndian(header->substr(kHeaderLength));
+    size = std::uint64_t{bigEndian32(header->data() + kHeaderLength)} << 32U |
+           bigEndian32(header->data() + kHeaderLength + kSizeLength);
   } else if (size == kToEndOfFile) {
     size = source_.size() - offset;
   }
   // Held against what is left, never added to the offset before: a huge size would wrap around.
   if (size < headerLength || size > left) return std::nullopt;
-  const auto type = static_cast<std::uint32_t>(bigEndian(header->substr(kSizeLength, kSizeLength)));
-  return Box{type, offset + headerLength, offset + size};
+  return Box{bigEndian32(header->data() + kSizeLength), offset + headerLength, offset + size};
 }
 
 std::optional<std::string_view> BoxReader::bytesAt(std::uint64_t offset, std::size_t length) {
@@ -59,10 +59,11 @@ bool BoxReader::moveWindowTo(std::uint64_t offset) {
   return true;
 }
 
-std::uint64_t bigEndian(std::string_view bytes) {
-  std::uint64_t number = 0;
-  for (const char byte : bytes) number = number << 8U | static_cast<unsigned char>(byte);
-  return number;
+std::uint32_t bigEndian32(const char* bytes) {
+  const auto byte = [bytes](std::size_t index) {
+    return std::uint32_t{static_cast<unsigned char>(bytes[index])};
+  };
+  return byte(0) << 24U | byte(1) << 16U | byte(2) << 8U | byte(3);
 }
 
 }  // namespace norvex

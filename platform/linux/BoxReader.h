@@ -64,7 +64,7 @@ class BoxReader {
   std::size_t boxesRead_ = 0;
 };
 
-// The unsigned number that eight or fewer bytes stand for, the most significant one first.
-std::uint64_t bigEndian(std::string_view bytes);
+// The unsigned number that the four bytes at `bytes` stand for, the most significant one first.
+std::uint32_t bigEndian32(const char* bytes);
 
 }  // namespace norvex

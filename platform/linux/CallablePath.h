@@ -10,7 +10,7 @@
 #include <string>
 #include <string_view>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 

@@ -8,7 +8,7 @@
 #include <cerrno>
 #include <thread>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 namespace {

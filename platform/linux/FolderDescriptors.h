@@ -13,7 +13,7 @@
 #include <memory>
 #include <vector>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/WalkedFolder.h"
 
 namespace norvex {

@@ -9,8 +9,8 @@
 #include <thread>
 
 #include "platform/ActivityScheduler.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/Environment.h"
-#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 

@@ -2,8 +2,8 @@
 
 #include <fcntl.h>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/CallablePath.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/FolderNames.h"
 
 namespace norvex {

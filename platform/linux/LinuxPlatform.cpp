@@ -13,8 +13,10 @@ constexpr const char* kOwnFolder = "/norvex";
 
 }  // namespace
 
-LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environment& environment)
+LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environment& environment,
+                             SystemLog& systemLog)
     : folders_(XdgFolders::fromEnvironment(environment)),
+      systemLog_(systemLog),
       processControl_(std::vector<std::string>(argv, argv + argc)),
       userFolders_(folders_),
       backupSettings_({folders_.config, kSystemConfigFolder}, systemLog_),

@@ -25,7 +25,6 @@
 #include "platform/linux/ProcStatusMemoryInfo.h"
 #include "platform/linux/StatvfsVolumeCatalog.h"
 #include "platform/linux/SteadyClock.h"
-#include "platform/linux/SyslogSystemLog.h"
 #include "platform/linux/ThreadEventLoops.h"
 #include "platform/linux/UserManagerJobRegistry.h"
 #include "platform/linux/XdgFolders.h"
@@ -34,8 +33,9 @@ namespace norvex {
 
 class LinuxPlatform {
  public:
-  // The command line as main got it, and the environment of the process.
-  LinuxPlatform(int argc, const char* const* argv, const Environment& environment);
+  // The command line as main got it, the environment of the process, and where lines for the system log go:
+  // the log itself, or the terminal of whoever runs the program. `systemLog` outlives this object.
+  LinuxPlatform(int argc, const char* const* argv, const Environment& environment, SystemLog& systemLog);
   LinuxPlatform(const LinuxPlatform&) = delete;
   LinuxPlatform& operator=(const LinuxPlatform&) = delete;
 
@@ -50,7 +50,7 @@ class LinuxPlatform {
 
  private:
   XdgFolders folders_;
-  SyslogSystemLog systemLog_;
+  SystemLog& systemLog_;
   LinuxProcessControl processControl_;
   LinuxUserFolders userFolders_;
   ConfBackupSettings backupSettings_;

@@ -4,9 +4,9 @@
 
 #include <cerrno>
 
+#include "platform/FileDescriptor.h"
 #include "platform/PackageNames.h"
 #include "platform/linux/CallablePath.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/ItemAttributes.h"
 #include "platform/linux/PackageMark.h"
 #include "platform/linux/VolumeStatistics.h"

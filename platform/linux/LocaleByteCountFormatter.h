@@ -18,9 +18,10 @@ class LocaleByteCountFormatter final : public ByteCountFormatter {
   // unit stays in the smaller one: 999,999 is "1000 KB", or "1,000 KB" where thousands are grouped.
   std::string string(std::uint64_t bytes) const override;
 
- private:
+  // A whole number with the locale's grouping of its digits.
   std::string grouped(std::uint64_t number) const;
 
+ private:
   std::string decimalSeparator_ = ".";  // in UTF-8, as the next one
   std::string thousandsSeparator_;
   std::string grouping_;  // as in lconv: sizes of the groups from the right, the last one repeats

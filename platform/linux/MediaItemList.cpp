@@ -27,6 +27,9 @@ constexpr std::uint32_t kFreeFormName = boxType("name");
 // One byte of version and three of flags, with which some boxes begin.
 constexpr std::uint64_t kVersionLength = 4;
 
+// Most lists are shorter: their keys take one allocation.
+constexpr std::size_t kUsualItems = 32;
+
 class Walk {
  public:
   explicit Walk(ByteSource& source) : reader_(source) {}
@@ -76,7 +79,7 @@ bool Walk::enter(const Box& parent, std::size_t level) {
 std::uint64_t Walk::firstChild(const Box& parent) {
   if (parent.type != kMetadata) return parent.begin;
   const auto start = reader_.bytesAt(parent.begin, kVersionLength);
-  const bool startsWithZero = start && bigEndian(*start) == 0;
+  const bool startsWithZero = start && bigEndian32(start->data()) == 0;
   if (!startsWithZero) {
     const auto child = reader_.boxAt(parent.begin, parent);
     if (child && child->type >> 24U != 0) return parent.begin;
@@ -85,6 +88,7 @@ std::uint64_t Walk::firstChild(const Box& parent) {
 }
 
 void Walk::readItems(const Box& list) {
+  keys_.reserve(kUsualItems);
   std::uint64_t at = list.begin;
   while (keys_.size() < maxMediaItems) {
     const auto item = reader_.boxAt(at, list);

@@ -12,7 +12,7 @@
 #include <sstream>
 #include <string>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 namespace {

@@ -6,6 +6,8 @@
 
 #include <cerrno>
 
+#include "platform/linux/CallablePath.h"
+
 namespace norvex {
 namespace {
 
@@ -13,14 +15,17 @@ constexpr int kOpenFlags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLO
 
 // The only place that uses the path.
 FileDescriptor openForReading(const std::string& path) {
+  const CallablePath callable(path);
+  if (callable.error() != 0) return {};
   // Asked before opening, since the opening itself releases whoever waits at the other end of a FIFO.
   struct stat attributes = {};
-  if (::fstatat(AT_FDCWD, path.c_str(), &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
+  if (::fstatat(callable.folder(), callable.path(), &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
   if (!S_ISREG(attributes.st_mode)) return {};
 
-  FileDescriptor file(::openat(AT_FDCWD, path.c_str(), kOpenFlags | O_NOATIME));
+  FileDescriptor file(::openat(callable.folder(), callable.path(), kOpenFlags | O_NOATIME));
   // Only the owner of a file may leave its time of last access alone.
-  if (!file && errno == EPERM) file = FileDescriptor(::openat(AT_FDCWD, path.c_str(), kOpenFlags));
+  if (!file && errno == EPERM)
+    file = FileDescriptor(::openat(callable.folder(), callable.path(), kOpenFlags));
   return file;
 }
 

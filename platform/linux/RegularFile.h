@@ -7,8 +7,8 @@
 #include <string>
 #include <utility>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/ByteSource.h"
-#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 

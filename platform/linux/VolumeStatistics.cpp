@@ -4,8 +4,8 @@
 
 #include <cerrno>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/CallablePath.h"
-#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 

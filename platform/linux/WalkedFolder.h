@@ -11,7 +11,7 @@
 #include <memory>
 #include <vector>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/ItemAttributes.h"
 
 namespace norvex {

@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/FolderNames.h"
 #include "platform/linux/NamedStreams.h"
 #include "platform/linux/WalkedFolder.h"

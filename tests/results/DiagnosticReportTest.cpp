@@ -13,21 +13,21 @@
 
 #include "GoldenFile.h"
 #include "RecordFields.h"
-#include "ReportWorld.h"
 #include "results/ReportTables.h"
+#include "tests/support/TestPlatform.h"
 
 namespace norvex {
 namespace {
 
 using testing::ElementsAre;
 using testing::SizeIs;
-using Message = ReportWorld::Message;
+using Message = InMemoryDiagnosticLog::Message;
 
 constexpr const char* kBelowZero = "-93024035966911365120";
 
 // The messages that the record sends.
 std::vector<Message> messagesOf(const NVXScannerResults& record, bool onInternalInstall) {
-  ReportWorld world;
+  TestPlatform world;
   world.installation.isInternal = onInternalInstall;
   record.logToWendal();
   return world.diagnosticLog.messages;
@@ -65,7 +65,7 @@ TEST(DiagnosticReport, SendsTheFirstTwoMessagesAloneElsewhere) {
 }
 
 TEST(DiagnosticReport, AsksForTheKindOfInstallationBetweenTheSecondAndTheThirdMessage) {
-  ReportWorld world;
+  TestPlatform world;
   world.installation.isInternal = true;
   NVXScannerResults().logToWendal();
   EXPECT_THAT(world.calls.all(),
@@ -74,7 +74,7 @@ TEST(DiagnosticReport, AsksForTheKindOfInstallationBetweenTheSecondAndTheThirdMe
 }
 
 TEST(DiagnosticReport, AsksForTheKindOfInstallationOnceWhenItIsNotInternal) {
-  ReportWorld world;
+  TestPlatform world;
   NVXScannerResults().logToWendal();
   EXPECT_THAT(world.calls.all(),
               ElementsAre("logWithKeys com.brixo.norvex.run2", "logWithKeys com.brixo.norvex.filecounts.run3",
@@ -82,7 +82,7 @@ TEST(DiagnosticReport, AsksForTheKindOfInstallationOnceWhenItIsNotInternal) {
 }
 
 TEST(DiagnosticReport, SendsTheSameAgainWhenAskedAgain) {
-  ReportWorld world;
+  TestPlatform world;
   const NVXScannerResults record = fixedRecord();
   record.logToWendal();
   record.logToWendal();

@@ -10,8 +10,8 @@
 
 #include "GoldenFile.h"
 #include "RecordFields.h"
-#include "ReportWorld.h"
 #include "results/SummaryTable.h"
+#include "tests/support/TestPlatform.h"
 
 namespace norvex {
 namespace {
@@ -30,7 +30,7 @@ std::vector<std::string> linesOf(const std::string& text) {
 }
 
 std::string summaryOf(const NVXScannerResults& record) {
-  const ReportWorld world;
+  const TestPlatform world;
   return record.description();
 }
 
@@ -106,13 +106,13 @@ TEST(Summary, ChangesOneLineWhenAFieldChangesAndNoneForTheUserContent) {
 }
 
 TEST(Summary, IsReportedNowhere) {
-  const ReportWorld world;
+  const TestPlatform world;
   EXPECT_FALSE(fixedRecord().description().empty());
   EXPECT_THAT(world.calls.all(), IsEmpty());
 }
 
 TEST(SummaryTable, GivesTheLinesOneByOne) {
-  const ReportWorld world;
+  const TestPlatform world;
   const NVXScannerResults record = fixedRecord();
   std::string text;
   for (const SummaryRow& row : summaryRows()) text += summaryLine(row, record);

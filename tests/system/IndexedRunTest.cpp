@@ -1,13 +1,13 @@
 // The real programs together: the index of a volume of its own is built, then the agent reports what is on
 // it.
 #include <gtest/gtest.h>
-#include <sched.h>
 #include <sys/mount.h>
 #include <unistd.h>
 
 #include <nlohmann/json.hpp>
 
 #include "AgentWorld.h"
+#include "OwnVolume.h"
 #include "results/NVXScannerResults.h"
 
 namespace norvex {
@@ -16,37 +16,11 @@ namespace {
 namespace fs = std::filesystem;
 using nlohmann::json;
 
-constexpr int kNotAllowed = 77;
-
 std::string valueOf(const json& message, const std::string& key) {
   for (const json& pair : message["pairs"]) {
     if (pair[0] == "com.brixo.message." + key) return pair[1];
   }
   return "(no such key)";
-}
-
-void makeFile(const fs::path& file, std::uintmax_t size) {
-  AgentWorld::write(file, "");
-  fs::resize_file(file, size);
-}
-
-// A file system of the process's own, mounted at `folder`.
-void mountVolume(const fs::path& folder) {
-  fs::create_directory(folder);
-  if (unshare(CLONE_NEWNS) != 0 || mount("", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0 ||
-      mount("tmpfs", folder.c_str(), "tmpfs", 0, "size=64m") != 0) {
-    _exit(kNotAllowed);
-  }
-}
-
-int runIndexUpdate(const AgentWorld& world) {
-  const pid_t process = fork();
-  if (process == 0) {
-    for (const auto& [name, value] : world.environment) setenv(name.c_str(), value.c_str(), 1);
-    execl(NORVEX_TOOL_PROGRAM, NORVEX_TOOL_PROGRAM, "index", "update", nullptr);
-    _exit(127);
-  }
-  return AgentWorld::wait(process);
 }
 
 // Fills the volume, indexes it unless told not to, and goes on as the agent. The exit status of what went
@@ -57,7 +31,7 @@ int runOverVolume(AgentWorld& world, const std::function<void(const fs::path&)>&
   world.beforeExec = [&world, fill, volume] {
     mountVolume(volume);
     fill(volume);
-    if (const int status = runIndexUpdate(world); status != 0) _exit(status);
+    if (const int status = runTool(world, {"index", "update"}); status != 0) _exit(status);
   };
   return world.run({"--force"});
 }
@@ -112,7 +86,7 @@ TEST(IndexedRun, AVolumeWhoseFirstUpdateWasInterruptedKeepsTheAgentFromReporting
     // Without room for the finished index the update fails and leaves the empty one.
     const fs::path cache = world.root() / "cache";
     if (mount("tmpfs", cache.c_str(), "tmpfs", 0, "size=192k") != 0) _exit(kNotAllowed);
-    if (runIndexUpdate(world) == 0) _exit(70);
+    if (runTool(world, {"index", "update"}) == 0) _exit(70);
   };
   const int status = world.run({"--force"});
   if (status == kNotAllowed) GTEST_SKIP() << "mounting a file system of one's own is not allowed here";

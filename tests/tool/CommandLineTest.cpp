@@ -56,12 +56,24 @@ TEST(CommandLine, RefusesWhatMakesNoSense) {
   }
 }
 
+TEST(CommandLine, UpdatesTheIndexBeforeAMeasurementUnlessToldNotTo) {
+  const Parsed usual = parse({"preview"}), without = parse({"preview", "--no-index", "--json"});
+  EXPECT_TRUE(std::get<PreviewRequest>(std::get<CommandRequest>(usual.outcome)).updateIndex);
+  const auto& request = std::get<PreviewRequest>(std::get<CommandRequest>(without.outcome));
+  EXPECT_FALSE(request.updateIndex);
+  EXPECT_TRUE(request.json);
+}
+
 TEST(CommandLine, HelpOfEveryCommandHasAnExample) {
   const std::vector<const char*> cases[] = {{"--help"},
                                             {"index", "update", "--help"},
                                             {"index", "status", "--help"},
                                             {"index", "query", "--help"},
-                                            {"index", "show", "--help"}};
+                                            {"index", "show", "--help"},
+                                            {"preview", "--help"},
+                                            {"log", "--help"},
+                                            {"show", "--help"},
+                                            {"summary", "--help"}};
   for (const auto& arguments : cases) {
     const Parsed parsed = parse(arguments);
     EXPECT_EQ(std::get<ExitStatus>(parsed.outcome), ExitStatus::success);

@@ -58,11 +58,14 @@ ToolTestWorld::ToolTestWorld(const ConsoleStyle& style)
             stores,
             settings,
             byteCounts,
+            [](std::uint64_t number) { return std::to_string(number); },
             clock,
             [] { return kIndexed + 120; },
             [this](const std::string& path) { return path == volume(); },
             [](const std::string& path) { return path; },
             cache.path("data"),
+            cache.path("diagnostics.jsonl"),
+            journal,
             cancelled} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();

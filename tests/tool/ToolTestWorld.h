@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
 #include "tests/support/CallJournal.h"
 #include "tests/support/InMemoryBackupSettings.h"
@@ -49,6 +50,7 @@ class ToolTestWorld {
   InMemoryBackupSettings settings{calls};
   InMemoryByteCountFormatter byteCounts;
   InMemoryClock clock;
+  InMemoryAgentJournal journal;
   std::atomic<bool> cancelled{false};
   std::ostringstream outText, errText;
   Console out, err;

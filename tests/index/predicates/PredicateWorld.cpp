@@ -2,6 +2,7 @@
 
 #include <sqlite3.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 
@@ -84,10 +85,6 @@ void answerPath(sqlite3_context* context, int, sqlite3_value** arguments) {
   sqlite3_result_blob64(context, path.data(), path.size(), SQLITE_TRANSIENT);
 }
 
-std::string queryFor(const PredicateSql& sql) {
-  return "SELECT i.id FROM items AS i WHERE " + sql.where + " ORDER BY i.id";
-}
-
 }  // namespace
 
 PredicateWorld::PredicateWorld() {
@@ -162,18 +159,20 @@ ItemIds PredicateWorld::matchesInMemory(const Predicate& predicate) const {
 
 std::variant<ItemIds, std::string> PredicateWorld::matchesInSql(const Predicate& predicate) const {
   const PredicateSql sql = compilePredicate(predicate);
-  Statement query(database_, queryFor(sql));
+  Statement query(database_, queryOf(sql));
   if (!query.isReady()) return query.message();
   if (const auto bound = bindPredicateValues(query.get(), sql); !bound) return bound.error().description;
+  bindItemRange(query.get(), 0, INT64_MAX);
   ItemIds ids;
   while (query.step()) ids.push_back(sqlite3_column_int64(query.get(), 0));
   if (query.failed()) return query.message();
+  std::ranges::sort(ids);
   return ids;
 }
 
 std::string PredicateWorld::planOf(const Predicate& predicate) const {
   const PredicateSql sql = compilePredicate(predicate);
-  Statement query(database_, "EXPLAIN QUERY PLAN " + queryFor(sql));
+  Statement query(database_, "EXPLAIN QUERY PLAN " + queryOf(sql));
   if (!query.isReady()) return query.message();
   if (const auto bound = bindPredicateValues(query.get(), sql); !bound) return bound.error().description;
   std::string plan;

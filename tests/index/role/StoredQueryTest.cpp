@@ -3,52 +3,17 @@
 
 #include <gmock/gmock.h>
 
-#include "TestVolume.h"
-#include "tests/support/TestPlatform.h"
+#include <algorithm>
+#include <functional>
+
+#include "QueriedVolume.h"
+#include "StoredItems.h"
 
 namespace norvex {
 namespace {
 
 using ::testing::ElementsAre;
 using ::testing::IsEmpty;
-
-void turnUntilStopped(TestPlatform& world, MetadataQuery& query) {
-  for (int pass = 0; pass < 1000 && !query.isStopped(); ++pass)
-    world.eventLoops.loop.runOnce(world.clock.now());
-}
-
-std::string pathOf(const MetadataResult& item) {
-  const auto value = item.valueForAttribute(kMDItemPath);
-  return value ? std::get<std::string>(*value) : "(no path)";
-}
-
-struct QueriedVolume {
-  TestPlatform world;
-  TestVolume volume;
-  VolumeStores stores{volume.stores()};
-
-  // The paths of the matches below the volume, in the query's order; "did not start" when it did not.
-  std::vector<std::string> search(const std::string& predicate) {
-    const auto query = makeStoredQuery(stores, world.eventLoops);
-    query->setPredicate(predicate);
-    query->setSearchScopes({Location::folder(volume.root())});
-    std::vector<std::string> found;
-    const auto token = query->addFinishObserver([&](MetadataQuery& finished) {
-      finished.stop();
-      for (std::size_t i = 0; i < finished.resultCount(); ++i) {
-        const std::string path = pathOf(*finished.resultAtIndex(i));
-        found.push_back(path.starts_with(volume.root()) ? path.substr(volume.root().size()) : path);
-      }
-    });
-    if (!query->start()) {
-      query->removeFinishObserver(token);
-      return {"did not start"};
-    }
-    turnUntilStopped(world, *query);
-    query->removeFinishObserver(token);
-    return found;
-  }
-};
 
 TEST(StoredQuery, FindsNothingOnAVolumeWithoutAStore) {
   QueriedVolume queried;
@@ -113,12 +78,30 @@ TEST(StoredQuery, AScopeIsTheSameVolumeHoweverItsPathIsWritten) {
   }
 }
 
-TEST(StoredQuery, GathersMoreThanABatch) {
+TEST(StoredQuery, KeepsTheOrderWhileOtherInputsHaveTheirTurnsBetweenItsPieces) {
   QueriedVolume queried;
-  constexpr std::size_t kFiles = 10'000;
-  for (std::size_t i = 0; i < kFiles; ++i) queried.volume.file("f" + std::to_string(i) + ".png");
   ASSERT_TRUE(queried.volume.update().ok());
-  EXPECT_EQ(queried.search("kMDItemContentType == 'public.png'").size(), kFiles);
+  addStoredItems(queried.volume, 10, 50'000);
+  EventLoop& loop = queried.world.eventLoops.loop;
+  for (const char* predicate : {"kMDItemContentTypeTree == 'odd'", "kMDItemFSName != 'f10'"}) {
+    int turns = 0;
+    bool isSearched = false;
+    std::function<void()> otherInput = [&] {
+      ++turns;
+      if (!isSearched) loop.post(otherInput);
+    };
+    loop.post(otherInput);
+    const auto found = queried.search(predicate);
+    isSearched = true;
+    loop.runOnce(queried.world.clock.now());  // the last of the other inputs
+    EXPECT_GE(turns, 3) << predicate;
+    EXPECT_GT(found.size(), 30'000U) << predicate;
+    // "" is the volume's root, which the second predicate finds first.
+    const auto numberOf = [](const std::string& path) {
+      return path.empty() ? 1 : std::stol(path.substr(2));
+    };
+    EXPECT_TRUE(std::ranges::is_sorted(found, std::ranges::less(), numberOf)) << predicate;
+  }
 }
 
 TEST(StoredQuery, DoesNotStartWithWhatIsNoPredicate) {

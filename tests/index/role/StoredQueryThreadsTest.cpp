@@ -4,6 +4,7 @@
 #include <atomic>
 #include <thread>
 
+#include "StoredItems.h"
 #include "TestVolume.h"
 #include "index/StoredMetadataIndex.h"
 #include "scanner/NVXScanner.h"
@@ -15,8 +16,8 @@ namespace {
 TEST(StoredQueryThreads, TheWaitEndsWithTheWorkAndNotWithItsDeadline) {
   TestPlatform world(TestThreads::several);
   TestVolume volume;
-  for (int i = 0; i < 5000; ++i) volume.file("f" + std::to_string(i) + ".png");
   ASSERT_TRUE(volume.update().ok());
+  addStoredItems(volume, 10, 3 * 5000);
   VolumeStores stores(volume.stores());
   StoredMetadataIndex index(stores, world.threadedEventLoops);
 
@@ -28,7 +29,7 @@ TEST(StoredQueryThreads, TheWaitEndsWithTheWorkAndNotWithItsDeadline) {
     EventLoop& loop = world.threadedEventLoops.current();
     for (int round = 0; round < 7; ++round) {
       const auto query = index.createQuery();
-      query->setPredicate("kMDItemContentTypeTree == 'public.image'");
+      query->setPredicate("kMDItemContentType == 'two'");
       query->setSearchScopes({Location::folder(volume.root())});
       const auto token = query->addFinishObserver([&](MetadataQuery& finished) {
         finished.stop();

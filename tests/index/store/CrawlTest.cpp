@@ -85,13 +85,13 @@ TEST(Crawl, ReachesPathsOfTwentyThousandBytes) {
   TestVolume volume;
   const std::string name(200, 'd');
   std::string path;
-  ScopedFd folder(::open(volume.root().c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  FileDescriptor folder(::open(volume.root().c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
   for (int depth = 0; depth < 100; ++depth) {
-    ASSERT_EQ(::mkdirat(folder.get(), name.c_str(), 0700), 0);
-    folder = ScopedFd(::openat(folder.get(), name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    ASSERT_EQ(::mkdirat(folder.number(), name.c_str(), 0700), 0);
+    folder = FileDescriptor(::openat(folder.number(), name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
     path += name + "/";
   }
-  ASSERT_TRUE(ScopedFd(::openat(folder.get(), "end.png", O_WRONLY | O_CREAT | O_CLOEXEC, 0600)));
+  ASSERT_TRUE(FileDescriptor(::openat(folder.number(), "end.png", O_WRONLY | O_CREAT | O_CLOEXEC, 0600)));
   const auto summary = volume.update();
   ASSERT_TRUE(summary.ok());
   EXPECT_EQ(summary.value().figures.folders, 100U);

@@ -54,16 +54,16 @@ TEST(DamagedStore, IsToldByEveryFlippedByte) {
   TestVolume volume;
   fillVolume(volume);
   const auto size = static_cast<off_t>(std::filesystem::file_size(volume.storePath()));
-  const ScopedFd file(::open(volume.storePath().c_str(), O_RDWR | O_CLOEXEC));
+  const FileDescriptor file(::open(volume.storePath().c_str(), O_RDWR | O_CLOEXEC));
   for (off_t offset = 0; offset < size; offset += offset < 200 || offset > size - 100 ? 1 : 97) {
     char byte = 0;
-    ASSERT_EQ(::pread(file.get(), &byte, 1, offset), 1);
+    ASSERT_EQ(::pread(file.number(), &byte, 1, offset), 1);
     const char flipped = static_cast<char>(byte ^ 0x10);
-    ASSERT_EQ(::pwrite(file.get(), &flipped, 1, offset), 1);
+    ASSERT_EQ(::pwrite(file.number(), &flipped, 1, offset), 1);
     const auto reader = volume.open();
     ASSERT_FALSE(reader.ok()) << offset;
     EXPECT_TRUE(reader.error().code == kStoreDamaged || reader.error().code == kStoreTooNew) << offset;
-    ASSERT_EQ(::pwrite(file.get(), &byte, 1, offset), 1);
+    ASSERT_EQ(::pwrite(file.number(), &byte, 1, offset), 1);
   }
   EXPECT_EQ(useStore(volume), 0);
 }

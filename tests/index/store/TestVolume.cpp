@@ -94,8 +94,8 @@ void TestVolume::tamper(const char* sql) const {
   EXPECT_EQ(sqlite3_exec(connection, sql, nullptr, nullptr, &message), SQLITE_OK) << message;
   sqlite3_free(message);
   sqlite3_close(connection);
-  const ScopedFd file(::open(storePath().c_str(), O_RDWR | O_CLOEXEC));
-  ASSERT_TRUE(sealStore(file.get()).ok());
+  const FileDescriptor file(::open(storePath().c_str(), O_RDWR | O_CLOEXEC));
+  ASSERT_TRUE(sealStore(file.number()).ok());
 }
 
 std::string told(const std::optional<MetadataValue>& value) {

@@ -19,7 +19,9 @@
 
 #include "media/Boxes.h"
 #include "media/TempFolder.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
+#include "platform/linux/CallablePath.h"
+#include "tests/support/TreeOnDisk.h"
 
 namespace norvex {
 namespace {
@@ -84,6 +86,20 @@ TEST_F(Mpeg4MediaReaderTest, ReadsAFileWhoseMovieStandsBehindGigabytes) {
 
 TEST_F(Mpeg4MediaReaderTest, ReadsNamesThatAreNoText) {
   EXPECT_THAT(keysOf(write("\xFF\n\x01.m4a", purchased)), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFileWhosePathIsLongerThanTheKernelTakes) {
+  const ondisk::TreeOnDisk tree({}, ondisk::Medium::memory);
+  const std::string path = tree.addChain(100, std::string(200, 'd')) + "/song.m4a";
+  const CallablePath callable(path);
+  const FileDescriptor file(
+      ::openat(callable.folder(), callable.path(), O_CREAT | O_WRONLY | O_CLOEXEC, 0600));
+  const std::string bytes = purchased.text();
+  ASSERT_EQ(::write(file.number(), bytes.data(), bytes.size()), static_cast<ssize_t>(bytes.size()));
+
+  EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+  EXPECT_THAT(keysOf(path + "x"), IsEmpty());
+  EXPECT_THAT(keysOf(path.substr(0, path.size() / 2) + "x" + path.substr(path.size() / 2)), IsEmpty());
 }
 
 TEST_F(Mpeg4MediaReaderTest, FindsNothingInWhatIsNoMediaFile) {

@@ -10,7 +10,7 @@
 
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
 
 namespace norvex {

@@ -13,8 +13,8 @@
 
 #include "ChildProcess.h"
 #include "ScratchFolder.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/DiagnosticMessageText.h"
-#include "platform/linux/FileDescriptor.h"
 
 namespace norvex {
 namespace {

@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 
 namespace norvex {
 

@@ -8,7 +8,7 @@
 #include <cstring>
 
 #include "ScratchFolder.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/UserManagerJobRegistry.h"
 
 namespace norvex {

@@ -1,4 +1,6 @@
-// An open file descriptor that is closed when its owner goes. Owned by one object on one thread at a time.
+// An open file descriptor that is closed when its owner goes.
+//
+// For whatever speaks with the kernel itself. Owned by one object, on one thread at a time.
 #pragma once
 
 #include <unistd.h>

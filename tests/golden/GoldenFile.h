@@ -1,4 +1,6 @@
-// Expected outputs that stand whole in files, in tests/results/golden.
+// Expected outputs that stand whole in files, in the folder "golden" of the tests that include it.
+//
+// Compiled into each such test program (norvex_golden_files), which knows its own folder.
 #pragma once
 
 #include <string>

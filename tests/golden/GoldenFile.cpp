@@ -12,7 +12,7 @@ namespace norvex {
 namespace {
 
 std::string pathOf(const std::string& name) {
-  return NORVEX_SOURCE_DIR "/tests/results/golden/" + name;
+  return std::string(NORVEX_GOLDEN_FOLDER) + "/" + name;
 }
 
 bool isToBeRewritten() {
