@@ -1,10 +1,8 @@
-// Indexes one tree and says what that took: norvex_index_bench CACHE_FOLDER TREE [update|query]
+// Indexes one tree and says what that took: norvex_index_bench CACHE_FOLDER TREE
 //
-// `update` (the default) makes the store; `query` asks a store that is there: opening it, a type that nothing
-// has, and the paths of all images and music. Times in seconds. Ctrl-C leaves the old store.
+// Times in seconds. Ctrl-C leaves the old store.
 #include <sys/resource.h>
 
-#include <array>
 #include <atomic>
 #include <chrono>
 #include <csignal>
@@ -12,14 +10,10 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
-#include <string_view>
 
 #include "index/IndexUpdate.h"
-#include "index/StoreReader.h"
 
 namespace {
-
-using norvex::StoreReader;
 
 std::atomic<bool> cancelled{false};
 
@@ -64,48 +58,13 @@ int update(const norvex::StoreFolder& folder, const char* root) {
   return 0;
 }
 
-// Prints how many rows the statement gives and how long that took.
-int time(StoreReader& reader, const char* what, std::string_view sql) {
-  const double start = now();
-  auto statement = reader.prepare(sql);
-  if (!statement) return fail(statement.error());
-  int rows = 0, status = SQLITE_ROW;
-  while ((status = sqlite3_step(statement.value().get())) == SQLITE_ROW) ++rows;
-  if (status != SQLITE_DONE) return fail(reader.lastError());
-  std::printf("%s: %d rows in %.4f s\n", what, rows, now() - start);
-  return 0;
-}
-
-int query(const norvex::StoreFolder& folder, const char* root) {
-  const double start = now();
-  const auto reader = StoreReader::open(folder, root);
-  if (!reader) return fail(reader.error());
-  std::printf("open: %.4f s\n", now() - start);
-  constexpr std::array<std::array<const char*, 2>, 4> kQueries{{
-      {"no such type", "SELECT id FROM items WHERE type IN (SELECT id FROM types WHERE identifier='none')"},
-      {"no such ancestor",
-       "SELECT id FROM items WHERE type IN (SELECT type FROM type_tree WHERE ancestor='none')"},
-      {"images",
-       "SELECT path_of(id) FROM items WHERE type IN (SELECT type FROM type_tree WHERE "
-       "ancestor='public.image')"},
-      {"music",
-       "SELECT path_of(id) FROM items WHERE type IN (SELECT type FROM type_tree WHERE "
-       "ancestor='public.audio')"},
-  }};
-  int status = 0;
-  for (const auto& [what, sql] : kQueries) status |= time(*reader.value(), what, sql);
-  return status;
-}
-
 }  // namespace
 
 int main(int count, char** arguments) {
-  if (count < 3) {
-    std::fprintf(stderr, "usage: norvex_index_bench CACHE_FOLDER TREE [update|query]\n");
+  if (count != 3) {
+    std::fprintf(stderr, "usage: norvex_index_bench CACHE_FOLDER TREE\n");
     return 2;
   }
   std::signal(SIGINT, [](int) { cancelled = true; });
-  const norvex::StoreFolder folder(arguments[1]);
-  const bool isQuery = count > 3 && std::string_view(arguments[3]) == "query";
-  return isQuery ? query(folder, arguments[2]) : update(folder, arguments[2]);
+  return update(norvex::StoreFolder(arguments[1]), arguments[2]);
 }

@@ -34,7 +34,7 @@ Result<void> StoreSearch::findMore(std::vector<std::int64_t>& matches) {
   const std::size_t before = matches.size();
   const std::int64_t end = last_ - next_ < length_ ? last_ : next_ + length_ - 1;
   store_->allowWork(length_ > kFewestItems ? kWorkOfAPiece : StoreReader::kAllWork);
-  const auto found = findBetween(next_, end, matches);
+  auto found = findBetween(next_, end, matches);
   if (found) {
     // SQLite finds them type by type.
     std::sort(matches.begin() + static_cast<std::ptrdiff_t>(before), matches.end());

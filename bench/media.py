@@ -1,21 +1,5 @@
-#!/usr/bin/env bash
-# Measures the media reader against a program made with TagLib and against exiftool, over 1,000 files.
-#
-# The runs take turns, so that a busy machine is busy for all of them, and are compared by their median wall time.
-# Fails when the reader takes more than 1/8 of the TagLib program's time or 1/300 of exiftool's.
-set -euo pipefail
-. "$(dirname "${BASH_SOURCE[0]}")/common.sh"
+"""Runs the media reader, the TagLib program and exiftool in turns and compares their median wall times."""
 
-install_packages build bench
-build release -DNORVEX_BUILD_BENCH=ON
-files=$project/build/bench-media
-if [ ! -e "$files/manifest.jsonl" ]; then
-  rm -rf "$files"
-  say "Making 1,000 media files (some 80 MB) ..."
-  python3 "$project/scripts/make-media" "$files" --files 1000 --seed 1 >/dev/null
-fi
-
-exec python3 - "$files" "$project/build/release/bench" <<'PYTHON'
 import json, os, statistics, subprocess, sys, time
 
 root, programs = sys.argv[1:]
@@ -45,7 +29,7 @@ for turn in range(ROUNDS):
         done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, text=True)
         times[name].append(time.perf_counter() - start)
         if answer(name, done.stdout) != purchased:
-            sys.exit("bench-media: %s found %d purchased files of %d" % (name, answer(name, done.stdout), purchased))
+            sys.exit("%s found %d purchased files of %d" % (name, answer(name, done.stdout), purchased))
 
 median = {name: statistics.median(taken) for name, taken in times.items()}
 print("%d files, %d of them purchased; page cache warm; median of %d runs (exiftool %d)"
@@ -59,4 +43,3 @@ for name, goal in (("taglib", 8), ("exiftool", 300)):
     kept &= ratio >= goal
     print("reader takes 1/%.0f of %s (goal: at most 1/%d)%s" % (ratio, name, goal, "" if ratio >= goal else "   MISSED"))
 sys.exit(0 if kept else 1)
-PYTHON
