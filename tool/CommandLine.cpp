@@ -34,6 +34,8 @@ class Grammar {
     addSummary();
     addShow();
     addLog();
+    addAgent();
+    add<DoctorRequest>(program, "doctor", "Show what works on this machine and what does not", help::kDoctor);
   }
 
   // The command that was parsed, with its arguments.
@@ -123,6 +125,16 @@ class Grammar {
     app.add_option("--since", request.since, "Only from this moment on")->type_name("MOMENT");
     app.add_option("--domain", request.domain, "Only messages of this domain, or ending so, such as run2")
         ->type_name("DOMAIN");
+  }
+
+  void addAgent() {
+    CLI::App& agent = *program.add_subcommand("agent", "The agent that reports, and its job");
+    agent.require_subcommand(1);
+    agent.footer(help::kAgent);
+    add<AgentStatusRequest>(agent, "status", "Show whether it has reported, and why not", help::kAgentStatus);
+    add<AgentRunRequest>(agent, "run", "Start it now", help::kAgentRun);
+    add<AgentEnableRequest>(agent, "enable", "Switch its job on for you", help::kAgentEnable);
+    add<AgentDisableRequest>(agent, "disable", "Switch its job off for you", help::kAgentDisable);
   }
 
   std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;

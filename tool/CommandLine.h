@@ -6,6 +6,9 @@
 #include <ostream>
 #include <variant>
 
+#include "tool/AgentControlCommand.h"
+#include "tool/AgentStatusCommand.h"
+#include "tool/DoctorCommand.h"
 #include "tool/ExitStatus.h"
 #include "tool/IndexQueryCommand.h"
 #include "tool/IndexShowCommand.h"
@@ -21,7 +24,8 @@ namespace norvex {
 // One alternative a command.
 using CommandRequest =
     std::variant<IndexUpdateRequest, IndexStatusRequest, IndexQueryRequest, IndexShowRequest, PreviewRequest,
-                 SummaryRequest, ShowRequest, LogRequest>;
+                 SummaryRequest, ShowRequest, LogRequest, AgentStatusRequest, AgentRunRequest,
+                 AgentEnableRequest, AgentDisableRequest, DoctorRequest>;
 
 // The command that was asked for; or the status to end with when nothing is left to do, because help was
 // asked for and written to `out`, or because `err` has been told what makes no sense.

@@ -70,4 +70,40 @@ inline constexpr const char* kLog =
     "Example:\n"
     "  norvexctl log --since 2w --domain run2";
 
+inline constexpr const char* kAgent =
+    "Example:\n"
+    "  norvexctl agent status";
+
+inline constexpr const char* kAgentStatus =
+    "Shows when this release has reported, whether the job is on and who has decided that, and, when "
+    "nothing\n"
+    "has been reported, what of the last run and of the included volumes tells why.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent status --json";
+
+inline constexpr const char* kAgentRun =
+    "The job's conditions hold: not on battery, not while other programs wait for memory, disk or "
+    "processor,\n"
+    "and not where reporting is switched off. The agent reports only if this release has not.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent run && norvexctl agent status";
+
+inline constexpr const char* kAgentEnable =
+    "Example:\n"
+    "  norvexctl agent enable";
+
+inline constexpr const char* kAgentDisable =
+    "For good, in all releases: echo DO_NOT_TRACK=1 >> ~/.config/environment.d/norvex.conf\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent disable";
+
+inline constexpr const char* kDoctor =
+    "Exit status 1 when something is broken; what has a substitute is told and no failure.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl doctor";
+
 }  // namespace norvex::help

@@ -18,7 +18,9 @@
 #include "tool/Commands.h"
 #include "tool/ConsoleSystemLog.h"
 #include "tool/StopSignals.h"
+#include "tool/SystemdAgentJob.h"
 #include "tool/SystemdAgentJournal.h"
+#include "tool/WaitingAgent.h"
 
 namespace {
 
@@ -47,6 +49,7 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
   const ScopedPlatform installed(roles);
   const LocaleByteCountFormatter numbers;
   SystemdAgentJournal journal;
+  SystemdAgentJob job(environment);
   ToolWorld world{.out = out,
                   .err = err,
                   .stores = machine.storeFolder(),
@@ -59,7 +62,10 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
                   .absolute = absolutePath,
                   .dataHome = machine.folders().data,
                   .messagesFile = FileDiagnosticLog::pathBelow(machine.folders().state),
+                  .disabledFile = "/etc/norvex/disabled",
                   .agentJournal = journal,
+                  .agentJob = job,
+                  .wakeWaitingAgent = [] { return wakeWaitingAgent().has_value(); },
                   .cancelled = stopWanted()};
 
   ExitStatus status = runCommand(world, request);

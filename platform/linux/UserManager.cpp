@@ -254,6 +254,22 @@ Result<std::vector<std::string>> UserManager::unitFiles(const std::vector<std::s
   return names;
 }
 
+Result<std::vector<std::string>> UserManager::environment() {
+  constexpr const char* kEnvironment = "Environment";
+  BusError error;
+  sd_bus_message* reply = nullptr;
+  int result = ::sd_bus_get_property(bus_.get(), kManagerName, kManagerPath, kManagerInterface, kEnvironment,
+                                     error.address(), &reply, "as");
+  const BusMessage owned(reply);
+  if (result >= 0) result = ::sd_bus_message_enter_container(reply, SD_BUS_TYPE_ARRAY, "s");
+  std::vector<std::string> variables;
+  const char* variable = nullptr;
+  while (result >= 0 && (result = ::sd_bus_message_read_basic(reply, SD_BUS_TYPE_STRING, &variable)) > 0)
+    variables.emplace_back(variable);
+  if (result < 0) return error.of(kEnvironment, result);
+  return variables;
+}
+
 Result<void> UserManager::mask(const std::string& unit) {
   return withoutReply(
       call(bus_.get(), "MaskUnitFiles", unit, "asbb", 1, unit.c_str(), kNotOnlyForThisBoot, kNotByForce));

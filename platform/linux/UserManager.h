@@ -75,6 +75,9 @@ class UserManager {
   // The names of the unit files, masks included, that match one of the shell patterns, in order.
   Result<std::vector<std::string>> unitFiles(const std::vector<std::string>& patterns);
 
+  // The variables that the manager passes on to what it starts, each "NAME=value".
+  Result<std::vector<std::string>> environment();
+
   // For this user, on the disk. What is in memory follows with reload(). A mask is set for any name, also for
   // one that no unit has: ask first. It fails with EEXIST where the unit's own file stands in its place.
   Result<void> mask(const std::string& unit);

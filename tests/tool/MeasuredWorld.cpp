@@ -42,7 +42,10 @@ MeasuredWorld::MeasuredWorld(const ConsoleStyle& style)
             .absolute = [](const std::string& path) { return path; },
             .dataHome = cache_.path("data"),
             .messagesFile = cache_.path("diagnostics.jsonl"),
+            .disabledFile = "/etc/norvex/disabled",
             .agentJournal = journal,
+            .agentJob = job,
+            .wakeWaitingAgent = [this] { return agentWaits; },
             .cancelled = cancelled_} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();

@@ -7,6 +7,7 @@
 #include <sstream>
 #include <string>
 
+#include "InMemoryAgentJob.h"
 #include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
@@ -42,6 +43,8 @@ class MeasuredWorld : public ScanWorld {
 
  public:
   InMemoryAgentJournal journal;
+  InMemoryAgentJob job;
+  bool agentWaits = false;  // for the word to run
   ToolWorld world;
 };
 

@@ -65,7 +65,10 @@ ToolTestWorld::ToolTestWorld(const ConsoleStyle& style)
             [](const std::string& path) { return path; },
             cache.path("data"),
             cache.path("diagnostics.jsonl"),
+            cache.path("disabled"),
             journal,
+            job,
+            [] { return false; },
             cancelled} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();

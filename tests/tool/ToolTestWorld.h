@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "InMemoryAgentJob.h"
 #include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
 #include "tests/support/CallJournal.h"
@@ -51,6 +52,7 @@ class ToolTestWorld {
   InMemoryByteCountFormatter byteCounts;
   InMemoryClock clock;
   InMemoryAgentJournal journal;
+  InMemoryAgentJob job;
   std::atomic<bool> cancelled{false};
   std::ostringstream outText, errText;
   Console out, err;
