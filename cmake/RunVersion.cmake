@@ -1,5 +1,5 @@
-# The run version stands in the identity of the agent and nowhere else: the names of the timer and of whatever else carries it
-# are made from there, so that they cannot differ from what the agent writes into the preferences.
+# The agent's label and the run version stand in its identity and nowhere else: the names of the units and of whatever else
+# carries them are made from there, so that they cannot differ from what the agent asks for and writes.
 set(run_version_source ${CMAKE_SOURCE_DIR}/agent/AgentIdentity.h)
 set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${run_version_source})
 
@@ -11,6 +11,7 @@ if(NOT definition_count EQUAL 1)
 endif()
 string(REGEX MATCH "[0-9]+" NORVEX_RUN_VERSION "${definitions}")
 
-set(NORVEX_LABEL com.brixo.NorvexAgent)
+string(REGEX MATCH "agentLabel = \"([^\"]+)\"" ignored "${identity}")
+set(NORVEX_LABEL ${CMAKE_MATCH_1})
 set(NORVEX_SERVICE ${NORVEX_LABEL}.service)
 set(NORVEX_TIMER ${NORVEX_LABEL}.run${NORVEX_RUN_VERSION}.timer)

@@ -166,6 +166,7 @@ def fish_text(text):
 
 
 FISH_ACTIONS = {"folder": "-a '(__fish_complete_directories)'", "path": "-F", TEXT: ""}
+FISH_VALUES = {"folder": "-x " + FISH_ACTIONS["folder"], "path": "-r -F", TEXT: "-x"}
 
 
 def fish(root, name):
@@ -190,7 +191,7 @@ def fish(root, name):
         lines += [f"{here} -a {c.words[-1]} -d {fish_text(c.text)}" for c in command.commands]
         for option in command.options:
             names = " ".join(f"-l {n[2:]}" if n.startswith("--") else f"-s {n[1:]}" for n in option.names)
-            value = f" -x {FISH_ACTIONS[option.kind]}".rstrip() if option.kind else ""
+            value = f" {FISH_VALUES[option.kind]}" if option.kind else ""
             lines.append(f"{here} {names}{value} -d {fish_text(option.text)}")
         lines += [f"{here} {FISH_ACTIONS[kind]}" for kind in command.arguments if FISH_ACTIONS[kind]]
     return "\n".join([*lines, ""])

@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
-"""Every command and option of a program is completed in each shell, asked of the shells themselves.
+"""Every command and option of a program is completed in each shell, asked of the shells themselves, and is in the manual.
 
-usage: CompletionsTest.py PROGRAM FOLDER      FOLDER holds the completions
+usage: words_test.py PROGRAM FOLDER MANUAL      FOLDER holds the completions, MANUAL is the page of the program
 """
 
 import pathlib
@@ -12,6 +12,7 @@ import unittest
 
 PROGRAM = pathlib.Path(sys.argv[1])
 FOLDER = pathlib.Path(sys.argv[2])
+MANUAL = pathlib.Path(sys.argv[3])
 
 
 def words_of(command):
@@ -19,7 +20,7 @@ def words_of(command):
     text = subprocess.run([PROGRAM, *command, "--help"], check=True, capture_output=True, text=True).stdout
     sections = dict(re.findall(r"^([A-Z][a-z]+):\n((?:  .*\n?)+)", text, re.M))
     commands = re.findall(r"^  (\w+)", sections.get("Subcommands", ""), re.M)
-    options = [name for left in re.findall(r"^  (-\S+)", sections["Options"], re.M) for name in left.split(",")]
+    options = [name for left in re.findall(r"^  (-[-\w,]+)", sections["Options"], re.M) for name in left.split(",")]
     return commands, options
 
 
@@ -77,6 +78,29 @@ class Completions(unittest.TestCase):
                 self.assertIn(f"{word}) _norvexctl_{'_'.join([*command, word])} ;;", body)
             for option in options:
                 self.assertRegex(body, rf"'\*?{option}\[")
+
+
+class Manual(unittest.TestCase):
+    page = re.sub(r"\\f[BIR]", "", MANUAL.read_text()).replace("\\-", "-")
+    synopsis = re.search(r"^\.SH SYNOPSIS\n(.*?)^\.SH", page, re.M | re.S).group(1)
+
+    def lines_of(self, command):
+        return [line for line in self.synopsis.splitlines() if re.match(rf"\.B norvexctl {' '.join(command)}( |$)", line)]
+
+    def test_names_every_command_and_option(self):
+        for command in all_commands():
+            commands, options = words_of(command)
+            with self.subTest(command=command):
+                if command and not commands:
+                    self.assertEqual(len(self.lines_of(command)), 1)
+                for option in options:
+                    self.assertIn(option, self.page)
+
+    def test_names_no_command_that_there_is_not(self):
+        known = {" ".join(command) for command in all_commands()}
+        for line in self.synopsis.splitlines():
+            if named := re.match(r"\.B norvexctl ([a-z ]*[a-z])", line):
+                self.assertIn(named.group(1), known)
 
 
 if __name__ == "__main__":
