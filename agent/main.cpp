@@ -8,21 +8,13 @@
 #include <mutex>
 #include <string>
 
+#include "agent/AgentIdentity.h"
 #include "platform/Platform.h"
 #include "scanner/DebugLevel.h"
 #include "scanner/NVXScanner.h"
 
 namespace norvex {
 namespace {
-
-// One name for the scheduler's activity, the service manager's job and the domain of the preferences.
-constexpr const char* agentLabel = "com.brixo.NorvexAgent";
-
-// The preference that holds the run version of the last run that reported.
-constexpr const char* lastVersionRunKey = "LastVersionRun";
-
-// Raised by each release that is to report anew.
-constexpr std::int64_t currentRunVersion = 4;
 
 constexpr const char* forceArgument = "--force";
 

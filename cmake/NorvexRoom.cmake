@@ -72,20 +72,48 @@ function(norvex_test name)
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 60 ${labels})
 endfunction()
 
-# norvex_session_test(NAME SOURCES a.cpp ... SETUP setup.sh LIBRARIES norvex_x ...)
+# norvex_session_test(NAME SOURCES a.cpp ... SETUP setup.sh LIBRARIES norvex_x ... [ROOT])
 #
 # Declares the test program NAME, which runs as an unprivileged user inside a session of its own: a service manager,
 # a bus and a journal that are thrown away afterwards. SETUP is run as root before the session begins. The program is
-# run from a copy: the user of the session may not be allowed to read the build folder. Where no session can be made
+# run from a copy: the user of the session may not be allowed to read the build folder. With ROOT the session is root's,
+# for what nobody else may do to its services. Where no session can be made
 # the test is skipped; its output says why.
 function(norvex_session_test name)
-  cmake_parse_arguments(TEST "" "SETUP" "SOURCES;LIBRARIES" ${ARGN})
+  cmake_parse_arguments(TEST "ROOT" "SETUP" "SOURCES;LIBRARIES" ${ARGN})
   add_executable(${name} ${TEST_SOURCES})
   norvex_target_settings(${name})
   target_link_libraries(${name} PRIVATE ${TEST_LIBRARIES} GTest::gmock GTest::gtest_main)
   set(setup "set -e; install -m 755 '$<TARGET_FILE:${name}>' /run/${name}; . '${CMAKE_CURRENT_SOURCE_DIR}/${TEST_SETUP}'")
+  set(user "")
+  if(TEST_ROOT)
+    set(user -r)
+  endif()
   add_test(NAME ${name}
-    COMMAND ${CMAKE_SOURCE_DIR}/tests/system/with-user-session -s "${setup}" /run/${name}
+    COMMAND ${CMAKE_SOURCE_DIR}/tests/system/with-user-session ${user} -s "${setup}" /run/${name}
     WORKING_DIRECTORY /)
   set_tests_properties(${name} PROPERTIES SKIP_RETURN_CODE 77 LABELS session)
+endfunction()
+
+# norvex_session_cases(PREFIX SCRIPT ARGUMENT...)
+#
+# Declares a test for each case that `SCRIPT --list` names ("Claim=case", one a line): SCRIPT case ARGUMENT... Each makes
+# a session of its own; where none can be made the test is skipped, and its output says why. PREFIX_TESTS is set to
+# their names.
+function(norvex_session_cases prefix script)
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${script})
+  execute_process(
+    COMMAND ${CMAKE_COMMAND} -E env NORVEX_TIMER=${NORVEX_TIMER} ${Python3_EXECUTABLE} -B ${script} --list
+    OUTPUT_VARIABLE cases OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
+  string(REPLACE "\n" ";" cases "${cases}")
+  set(tests "")
+  foreach(case IN LISTS cases)
+    string(REGEX MATCH "^(.*)=(.*)$" ignored "${case}")
+    set(test ${prefix}.${CMAKE_MATCH_1})
+    add_test(NAME ${test} COMMAND ${Python3_EXECUTABLE} -B ${script} ${CMAKE_MATCH_2} ${ARGN})
+    set_tests_properties(${test} PROPERTIES
+      SKIP_RETURN_CODE 77 LABELS session ENVIRONMENT NORVEX_TIMER=${NORVEX_TIMER})
+    list(APPEND tests ${test})
+  endforeach()
+  set(${prefix}_TESTS ${tests} PARENT_SCOPE)
 endfunction()

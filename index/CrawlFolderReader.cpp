@@ -101,7 +101,7 @@ Result<CrawlFolder> CrawlFolderReader::enter(const std::string& path, const Craw
                                              const KeptFolder& around) {
   auto fd = volume_.openFolder(path, around);
   if (!fd) return fd.error();
-  if (volume_.mayHaveSnapshots() && !path.empty() && isReadOnlySnapshot(fd.value().get()))
+  if (volume_.mayHaveSnapshots() && !path.empty() && isReadOnlySnapshot(fd.value().number()))
     return systemError(EXDEV);
   return CrawlFolder{path, volume_.absolute(path), place, std::move(fd).value()};
 }
@@ -119,7 +119,7 @@ Result<bool> CrawlFolderReader::list(CrawlFolder& folder, CrawlNames& names, std
     });
   };
   while (names.bytes.size() < mostBytes) {
-    const long count = ::syscall(SYS_getdents64, folder.fd.get(), entries_.data(), entries_.size());
+    const long count = ::syscall(SYS_getdents64, folder.fd.number(), entries_.data(), entries_.size());
     if (count <= 0) {
       const int code = errno;
       sortNames();
@@ -139,12 +139,12 @@ Result<bool> CrawlFolderReader::list(CrawlFolder& folder, CrawlNames& names, std
 }
 
 void CrawlFolderReader::makeCurrent(const CrawlFolder& folder) {
-  isCurrent_ = hasOwnCurrentFolder_ && ::fchdir(folder.fd.get()) == 0;
+  isCurrent_ = hasOwnCurrentFolder_ && ::fchdir(folder.fd.number()) == 0;
 }
 
 const char* CrawlFolderReader::attributePath(const CrawlFolder& folder, const char* name) {
   if (isCurrent_) return name;
-  attributePath_ = "/proc/self/fd/" + std::to_string(folder.fd.get()) + "/" + name;
+  attributePath_ = "/proc/self/fd/" + std::to_string(folder.fd.number()) + "/" + name;
   return attributePath_.c_str();
 }
 
@@ -167,7 +167,7 @@ void CrawlFolderReader::readItem(const CrawlFolder& folder, std::string_view nam
                                  CrawlBatch& batch) {
   struct statx status {};
   // Relative to the current folder the kernel has no descriptor to look up and to hold.
-  const int from = isCurrent_ ? AT_FDCWD : folder.fd.get();
+  const int from = isCurrent_ ? AT_FDCWD : folder.fd.number();
   if (::statx(from, text, volume_.statFlags(), kWanted, &status) != 0) {
     if (!hasVanished(errno)) batch.problems.add(folder.absolute + "/" + text, errno);
     return;
@@ -257,7 +257,7 @@ void CrawlFolderReader::readFolderItself(const CrawlFolder& folder, const CrawlN
   if (names.contains(kCacheTagName) && carriesCacheTag(folder)) {
     addMark(batch, CrawledAttribute::kFolderItself, kExcluded);
   }
-  if (rules_.isPackage(type) && volume_.holdsFile(folder.fd.get(), kReceiptPathInPackage)) {
+  if (rules_.isPackage(type) && volume_.holdsFile(folder.fd.number(), kReceiptPathInPackage)) {
     addMark(batch, CrawledAttribute::kFolderItself, kHasReceipt);
   }
 }
@@ -266,15 +266,15 @@ bool CrawlFolderReader::carriesCacheTag(const CrawlFolder& folder) const {
   CacheTag tag;
   tag.isInVolumeRoot = folder.path.empty();
   struct stat status {};
-  if (::fstatat(folder.fd.get(), kCacheTagName.data(), &status, AT_SYMLINK_NOFOLLOW) != 0) return false;
+  if (::fstatat(folder.fd.number(), kCacheTagName.data(), &status, AT_SYMLINK_NOFOLLOW) != 0) return false;
   if (!S_ISREG(status.st_mode)) return false;
   // Should a device or a pipe take its place now, opening it must neither wait nor do anything.
-  const ScopedFd file(::openat(folder.fd.get(), kCacheTagName.data(),
-                               O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
-  tag.isRegularFile = file && ::fstat(file.get(), &status) == 0 && S_ISREG(status.st_mode);
+  const FileDescriptor file(::openat(folder.fd.number(), kCacheTagName.data(),
+                                     O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+  tag.isRegularFile = file && ::fstat(file.number(), &status) == 0 && S_ISREG(status.st_mode);
   if (!tag.isRegularFile) return false;
   std::array<char, kCacheTagSignatureSize> start{};
-  const ssize_t size = ::pread(file.get(), start.data(), start.size(), 0);
+  const ssize_t size = ::pread(file.number(), start.data(), start.size(), 0);
   tag.firstBytes = {start.data(), static_cast<std::size_t>(std::max<ssize_t>(size, 0))};
   return isValidCacheTag(tag);
 }
@@ -284,7 +284,7 @@ CrawledItem CrawlFolderReader::readRoot(CrawlFolder& root, CrawlBatch& batch) {
   CrawledItem item;
   item.kind = CrawlItemKind::folder;
   struct statx status {};
-  if (::statx(root.fd.get(), "", AT_EMPTY_PATH, kWanted, &status) == 0)
+  if (::statx(root.fd.number(), "", AT_EMPTY_PATH, kWanted, &status) == 0)
     item.mtime = nanoseconds(status.stx_mtime);
   const OwnAttributes own = readAttributes(root, ".", true, CrawledAttribute::kFolderItself, batch);
   item.type =

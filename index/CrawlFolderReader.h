@@ -15,7 +15,7 @@
 #include "index/CrawlBatch.h"
 #include "index/CrawlRules.h"
 #include "index/CrawlVolume.h"
-#include "index/ScopedFd.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Result.h"
 
 struct statx;
@@ -27,7 +27,7 @@ struct CrawlFolder {
   std::string path;      // below the volume's root, which is empty itself
   std::string absolute;  // what its items' places are told by
   CrawlPlace place;
-  ScopedFd fd;
+  FileDescriptor fd;
 };
 
 // Names of items of one folder, each ending in a NUL.

@@ -78,20 +78,20 @@ CrawlVolume::CrawlVolume(CrawlVolume&& other) noexcept
 Result<CrawlVolume> CrawlVolume::open(const std::string& root, const std::string& leftOutFolder) {
   CrawlVolume volume;
   volume.root_ = root;
-  volume.fd_ = ScopedFd(::open(root.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  volume.fd_ = FileDescriptor(::open(root.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
   if (!volume.fd_) return systemError(errno);
   struct statx status {};
-  if (::statx(volume.fd_.get(), "", AT_EMPTY_PATH, kWanted, &status) != 0) return systemError(errno);
+  if (::statx(volume.fd_.number(), "", AT_EMPTY_PATH, kWanted, &status) != 0) return systemError(errno);
   volume.mount_ = status.stx_mnt_id;
   volume.device_ = deviceOf(status);
   struct statfs info {};
-  if (::fstatfs(volume.fd_.get(), &info) != 0) return systemError(errno);
+  if (::fstatfs(volume.fd_.number(), &info) != 0) return systemError(errno);
   const auto type = static_cast<std::uint32_t>(info.f_type);
   volume.statFlags_ =
       AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT | (isRemote(type) ? AT_STATX_SYNC_AS_STAT : AT_STATX_DONT_SYNC);
   volume.mayHaveSnapshots_ = type == BTRFS_SUPER_MAGIC;
   // Old kernels have no openat2(), and some sandboxes refuse it.
-  volume.hasOpenat2_ = ScopedFd(openat2Below(volume.fd_.get(), ".", O_PATH)).get() >= 0;
+  volume.hasOpenat2_ = static_cast<bool>(FileDescriptor(openat2Below(volume.fd_.number(), ".", O_PATH)));
   if (::statx(AT_FDCWD, leftOutFolder.c_str(), 0, kWanted, &status) == 0) {
     volume.leftOutDevice_ = deviceOf(status);
     volume.leftOutInode_ = status.stx_ino;
@@ -107,57 +107,57 @@ std::string CrawlVolume::absolute(std::string_view path) const {
 }
 
 // Opens `path` below `folder`, in as many steps as its length or the kernel asks for.
-Result<ScopedFd> CrawlVolume::openBelow(int folder, std::string_view path, int flags) const {
+Result<FileDescriptor> CrawlVolume::openBelow(int folder, std::string_view path, int flags) const {
   const std::size_t longest = hasOpenat2_ ? kLongestPart : 0;
-  ScopedFd passed;
+  FileDescriptor passed;
   while (path.size() > longest && path.find('/') != std::string_view::npos) {
     const std::size_t end = std::min(path.rfind('/', longest), path.find('/', longest));
     auto part =
-        openPart(passed ? passed.get() : folder, std::string(path.substr(0, end)), O_PATH | O_DIRECTORY);
+        openPart(passed ? passed.number() : folder, std::string(path.substr(0, end)), O_PATH | O_DIRECTORY);
     if (!part) return part;
     passed = std::move(part).value();
     path.remove_prefix(end + 1);
   }
-  return openPart(passed ? passed.get() : folder, std::string(path), flags);
+  return openPart(passed ? passed.number() : folder, std::string(path), flags);
 }
 
-Result<ScopedFd> CrawlVolume::openPart(int folder, const std::string& path, int flags) const {
-  ScopedFd fd(hasOpenat2_ ? openat2Below(folder, path.c_str(), flags)
-                          : ::openat(folder, path.c_str(), flags | O_CLOEXEC | O_NOFOLLOW));
+Result<FileDescriptor> CrawlVolume::openPart(int folder, const std::string& path, int flags) const {
+  FileDescriptor fd(hasOpenat2_ ? openat2Below(folder, path.c_str(), flags)
+                                : ::openat(folder, path.c_str(), flags | O_CLOEXEC | O_NOFOLLOW));
   if (!fd) return systemError(errno);
   if (hasOpenat2_) return fd;
   struct statx status {};
-  if (::statx(fd.get(), "", AT_EMPTY_PATH | statFlags_, kWanted, &status) != 0) return systemError(errno);
+  if (::statx(fd.number(), "", AT_EMPTY_PATH | statFlags_, kWanted, &status) != 0) return systemError(errno);
   if (!holds(status)) return systemError(EXDEV);
   return fd;
 }
 
-Result<ScopedFd> CrawlVolume::openFolder(const std::string& path, const KeptFolder& around) const {
+Result<FileDescriptor> CrawlVolume::openFolder(const std::string& path, const KeptFolder& around) const {
   std::string_view place = path.empty() ? std::string_view(".") : std::string_view(path);
   if (around != nullptr) place.remove_prefix(place.rfind('/') + 1);
-  const int from = around != nullptr ? around->get() : fd_.get();
+  const int from = around != nullptr ? around->number() : fd_.number();
   // The folder's access time stays as it was where that is allowed: to its owner.
   auto fd = openBelow(from, place, O_RDONLY | O_DIRECTORY | O_NOATIME);
   if (fd || fd.error().code != EPERM) return fd;
   return openBelow(from, place, O_RDONLY | O_DIRECTORY);
 }
 
-KeptFolder CrawlVolume::keep(ScopedFd folder) const {
+KeptFolder CrawlVolume::keep(FileDescriptor folder) const {
   if (keptFolders_.fetch_add(1) >= kMostKeptFolders) {
     keptFolders_.fetch_sub(1);
     return nullptr;
   }
-  const auto giveUp = [this](const ScopedFd* kept) {
-    const std::unique_ptr<const ScopedFd> owner(kept);
+  const auto giveUp = [this](const FileDescriptor* kept) {
+    const std::unique_ptr<const FileDescriptor> owner(kept);
     keptFolders_.fetch_sub(1);
   };
-  return KeptFolder(std::make_unique<const ScopedFd>(std::move(folder)).release(), giveUp);
+  return KeptFolder(std::make_unique<const FileDescriptor>(std::move(folder)).release(), giveUp);
 }
 
 bool CrawlVolume::holdsFile(int folder, std::string_view path) const {
   const auto file = openBelow(folder, path, O_PATH);
   struct stat status {};
-  return file && ::fstat(file.value().get(), &status) == 0 && S_ISREG(status.st_mode);
+  return file && ::fstat(file.value().number(), &status) == 0 && S_ISREG(status.st_mode);
 }
 
 bool CrawlVolume::holds(const struct statx& status) const {

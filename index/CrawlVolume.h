@@ -9,7 +9,7 @@
 #include <string>
 #include <string_view>
 
-#include "index/ScopedFd.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Result.h"
 
 struct statx;
@@ -20,7 +20,7 @@ namespace norvex {
 Result<std::string> fileSystemIdAt(const std::string& path);
 
 // A folder that stays open because folders in it are going to be opened; empty for one that does not.
-using KeptFolder = std::shared_ptr<const ScopedFd>;
+using KeptFolder = std::shared_ptr<const FileDescriptor>;
 
 class CrawlVolume {
  public:
@@ -30,7 +30,7 @@ class CrawlVolume {
   CrawlVolume(CrawlVolume&& other) noexcept;
 
   const std::string& root() const { return root_; }
-  int rootFd() const { return fd_.get(); }
+  int rootFd() const { return fd_.number(); }
 
   // The absolute path of what is at `path` below the root.
   std::string absolute(std::string_view path) const;
@@ -39,10 +39,10 @@ class CrawlVolume {
   // link or another volume. Any length. errno on failure: EXDEV for another volume.
   // `around`: the folder that it is in, where that has been kept, which saves the kernel the way from the
   // root.
-  Result<ScopedFd> openFolder(const std::string& path, const KeptFolder& around = nullptr) const;
+  Result<FileDescriptor> openFolder(const std::string& path, const KeptFolder& around = nullptr) const;
 
   // Keeps a folder open, unless too many are.
-  KeptFolder keep(ScopedFd folder) const;
+  KeptFolder keep(FileDescriptor folder) const;
 
   // Whether there is a regular file at `path` below an open folder, no part of which is a link.
   bool holdsFile(int folder, std::string_view path) const;
@@ -65,11 +65,11 @@ class CrawlVolume {
  private:
   CrawlVolume() = default;
 
-  Result<ScopedFd> openBelow(int folder, std::string_view path, int flags) const;
-  Result<ScopedFd> openPart(int folder, const std::string& path, int flags) const;
+  Result<FileDescriptor> openBelow(int folder, std::string_view path, int flags) const;
+  Result<FileDescriptor> openPart(int folder, const std::string& path, int flags) const;
 
   std::string root_;
-  ScopedFd fd_;
+  FileDescriptor fd_;
   std::uint64_t mount_ = 0;
   std::uint64_t device_ = 0;
   std::uint64_t leftOutDevice_ = 0, leftOutInode_ = 0;

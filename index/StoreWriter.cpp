@@ -9,9 +9,9 @@
 #include <utility>
 #include <variant>
 
-#include "index/ScopedFd.h"
 #include "index/SparseAttributes.h"
 #include "index/StoreSeal.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Utf8.h"
 
 namespace norvex {
@@ -98,7 +98,7 @@ StoreWriter::StoreWriter(std::string path, StoreDatabase database, const std::at
 Result<StoreWriter> StoreWriter::create(const std::string& path, const std::atomic<bool>& cancelled) {
   if (::unlink(path.c_str()) != 0 && errno != ENOENT) return systemError(errno);
   // Made here and not by SQLite, so that it is the user's alone from its first moment.
-  if (!ScopedFd(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600))) {
+  if (!FileDescriptor(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600))) {
     return systemError(errno);
   }
   auto database = StoreDatabase::open(path, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX);
@@ -302,9 +302,9 @@ Result<void> StoreWriter::closeAndSeal() {
     statement->reset();
   }
   database_.reset();
-  const ScopedFd file(::open(path_.c_str(), O_RDWR | O_CLOEXEC | O_NOFOLLOW));
+  const FileDescriptor file(::open(path_.c_str(), O_RDWR | O_CLOEXEC | O_NOFOLLOW));
   if (!file) return systemError(errno);
-  return sealStore(file.get());
+  return sealStore(file.number());
 }
 
 Result<void> StoreWriter::finish(const StoreVolumeFacts& facts, std::int64_t healthCheckTime) {

@@ -114,24 +114,12 @@ class AgentScan {
   void tellRefusal(const std::vector<std::string>& refused) {
     for (const std::string& volume : volumes()) {
       if (isPlainFolder(volume)) {
-        tellPlainFolder(volume);
+        faults_.add(volume, plainFolderFault(volumeOf(world_, normalizedPath(volume))));
       } else if (lacksHealthCheck(volume)) {
-        faults_.add(volume, "unfinished",
-                    "the agent reports nothing: the first update of this volume's index is under way or was "
-                    "interrupted; finish it with: " +
-                        updateCommand(volume));
+        faults_.add(volume, unfinishedFault(volume));
       }
     }
     for (const std::string& volume : refused) tellUnsearchable(volume);
-  }
-
-  void tellPlainFolder(const std::string& folder) {
-    const std::string volume = volumeOf(world_, normalizedPath(folder));
-    faults_.add(folder, "plainFolder",
-                "the agent reports nothing as long as this is among the included volumes: it is a plain "
-                "folder of the volume " +
-                    safeText(volume) + ", which never gets an index of its own; name " + safeText(volume) +
-                    " in its place as IncludedVolumes in chronel/backup.conf");
   }
 
   void tellUnsearchable(const std::string& volume) {

@@ -32,6 +32,10 @@ class Grammar {
     addIndexShow(*index);
     addPreview();
     addSummary();
+    addShow();
+    addLog();
+    addAgent();
+    add<DoctorRequest>(program, "doctor", "Show what works on this machine and what does not", help::kDoctor);
   }
 
   // The command that was parsed, with its arguments.
@@ -106,6 +110,31 @@ class Grammar {
 
   void addSummary() {
     addNoIndex(add<SummaryRequest>(program, "summary", "Show every figure exactly", help::kSummary));
+  }
+
+  void addShow() {
+    const auto command = add<ShowRequest>(program, "show", "Show where the space went", help::kShow);
+    addNoIndex(command);
+    command.app.add_option("--html", command.request.htmlFile, "Write a page for the browser into this file")
+        ->type_name("FILE")
+        ->excludes(command.app.get_option("--json"));
+  }
+
+  void addLog() {
+    const auto [app, request] = add<LogRequest>(program, "log", "Show what has been reported", help::kLog);
+    app.add_option("--since", request.since, "Only from this moment on")->type_name("MOMENT");
+    app.add_option("--domain", request.domain, "Only messages of this domain, or ending so, such as run2")
+        ->type_name("DOMAIN");
+  }
+
+  void addAgent() {
+    CLI::App& agent = *program.add_subcommand("agent", "The agent that reports, and its job");
+    agent.require_subcommand(1);
+    agent.footer(help::kAgent);
+    add<AgentStatusRequest>(agent, "status", "Show whether it has reported, and why not", help::kAgentStatus);
+    add<AgentRunRequest>(agent, "run", "Start it now", help::kAgentRun);
+    add<AgentEnableRequest>(agent, "enable", "Switch its job on for you", help::kAgentEnable);
+    add<AgentDisableRequest>(agent, "disable", "Switch its job off for you", help::kAgentDisable);
   }
 
   std::vector<std::pair<CLI::App*, std::function<CommandRequest()>>> commands_;

@@ -1,17 +1,8 @@
 #include "tool/Faults.h"
 
-#include <array>
-
 #include "tool/SafeText.h"
 
 namespace norvex {
-namespace {
-
-// In the order of StoreFault::Kind.
-constexpr std::array<const char*, 5> kReasons{"missing", "unfinished", "damaged", "tooNew", "unreadable"};
-
-}  // namespace
-
 void Faults::add(const std::string& place, const std::string& reason, const std::string& message) {
   err_.tell(safeText(place) + ": " + message);
   JsonDocument fault;
@@ -22,7 +13,7 @@ void Faults::add(const std::string& place, const std::string& reason, const std:
 }
 
 void Faults::add(const std::string& volume, const StoreFault& fault) {
-  add(volume, kReasons[static_cast<std::size_t>(fault.kind)], fault.message);
+  add(volume, reasonText(fault.kind), fault.message);
 }
 
 }  // namespace norvex

@@ -56,4 +56,54 @@ inline constexpr const char* kSummary =
     "Example:\n"
     "  norvexctl summary | grep -i music";
 
+inline constexpr const char* kShow =
+    "Shows each volume, what is on it by kind, where images, music and movies lie, and what was bought.\n"
+    "The page of --html needs no network; it replaces the file in one step, readable by you alone.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl show --html ~/storage.html";
+
+inline constexpr const char* kLog =
+    "From the system's journal, and from the agent's own file where there was no journal; the newest last.\n"
+    "A MOMENT: 2026-11-21, \"2026-11-21 07:03\", today, or how long ago: 45min, 12h, 3d, 2w.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl log --since 2w --domain run2";
+
+inline constexpr const char* kAgent =
+    "Example:\n"
+    "  norvexctl agent status";
+
+inline constexpr const char* kAgentStatus =
+    "Shows when this release has reported, whether the job is on and who has decided that, and, when "
+    "nothing\n"
+    "has been reported, what of the last run and of the included volumes tells why.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent status --json";
+
+inline constexpr const char* kAgentRun =
+    "The job's conditions hold: not on battery, not while other programs wait for memory, disk or "
+    "processor,\n"
+    "and not where reporting is switched off. The agent reports only if this release has not.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent run && norvexctl agent status";
+
+inline constexpr const char* kAgentEnable =
+    "Example:\n"
+    "  norvexctl agent enable";
+
+inline constexpr const char* kAgentDisable =
+    "For good, in all releases: echo DO_NOT_TRACK=1 >> ~/.config/environment.d/norvex.conf\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl agent disable";
+
+inline constexpr const char* kDoctor =
+    "Exit status 1 when something is broken; what has a substitute is told and no failure.\n"
+    "\n"
+    "Example:\n"
+    "  norvexctl doctor";
+
 }  // namespace norvex::help

@@ -2,6 +2,9 @@
 
 #include <sys/stat.h>
 
+#include <algorithm>
+#include <vector>
+
 #include "tool/Faults.h"
 #include "tool/FigureText.h"
 #include "tool/JsonText.h"
@@ -29,6 +32,18 @@ VolumeStatus statusOf(const StoreFolder& stores, const StoreReader& store) {
           hasFile ? static_cast<std::uint64_t>(file.st_size) : 0};
 }
 
+// The positions that hold anything, the largest first.
+std::vector<SizeBar> barsOf(const AccumulatedSizes::Values& sizes) {
+  std::vector<SizeBar> bars;
+  for (std::size_t at = 0; at < sizes.size(); ++at) {
+    if (sizes[at] > 0)
+      bars.push_back({kStoragePositionNames[at].label, static_cast<std::uint64_t>(sizes[at])});
+  }
+  std::stable_sort(bars.begin(), bars.end(),
+                   [](const SizeBar& a, const SizeBar& b) { return a.bytes > b.bytes; });
+  return bars;
+}
+
 void writeText(ToolWorld& world, const VolumeStatus& status) {
   Console& out = world.out;
   const StoreCounts& counts = status.counts;
@@ -41,7 +56,7 @@ void writeText(ToolWorld& world, const VolumeStatus& status) {
                << countText(world.digits, counts.folders, "folder") << ")\n"
                << label("Unreadable  ") << world.digits(counts.unreadable) << '\n'
                << label("Index       ") << world.byteCounts.string(status.storeBytes) << "\n\n";
-  writeSizeBars(out, world.byteCounts, status.sizes);
+  writeSizeBars(out, world.byteCounts, barsOf(status.sizes));
 }
 
 JsonDocument jsonOf(const VolumeStatus& status) {

@@ -10,6 +10,7 @@
 #include "tool/Faults.h"
 #include "tool/FigureText.h"
 #include "tool/JsonText.h"
+#include "tool/KeyPrefix.h"
 #include "tool/TextTable.h"
 
 namespace norvex {
@@ -18,14 +19,10 @@ namespace {
 constexpr std::string_view kNotInternal =
     "this is no internal installation (there is no file /etc/norvex/internal-install)";
 
-// What every key of a message begins with, up to its last dot.
-std::string_view commonPrefix(const ReportMessage& message) {
-  std::string_view prefix = message.rows.front().key;
-  prefix = prefix.substr(0, prefix.rfind('.') + 1);
-  for (const ReportRow& row : message.rows) {
-    if (!row.key.starts_with(prefix)) return {};
-  }
-  return prefix;
+std::string_view keyPrefix(const ReportMessage& message) {
+  std::vector<std::string_view> keys;
+  for (const ReportRow& row : message.rows) keys.push_back(row.key);
+  return commonKeyPrefix(keys);
 }
 
 bool isSize(const ReportRow& row) {
@@ -68,7 +65,7 @@ class PreviewText {
   std::ostream& out() { return world_.out.stream(); }
 
   void writeMessage(const ReportMessage& message) {
-    const std::string_view prefix = commonPrefix(message);
+    const std::string_view prefix = keyPrefix(message);
     out() << world_.out.inked(Console::Ink::bold, message.domain) << ": "
           << countText(world_.digits, message.rows.size(), "figure") << ", level " << message.level << '\n';
     if (!prefix.empty()) out() << "Each key begins with " << prefix << '\n';

@@ -14,7 +14,7 @@ constexpr std::uint64_t kItemsPerLook = 64;
 ScanProgress::ScanProgress(ToolWorld& world, std::size_t volumes)
     : world_(world),
       queries_(volumes * NVXScanner::queriesPerVolume),
-      place_("Folders of your own"),
+      place_("folders of your own"),
       line_(world.err, world.clock) {
   showWhenDue();
 }
@@ -41,9 +41,9 @@ void ScanProgress::showWhenDue() {
   const auto elapsed = line_.elapsed();
   const double done =
       queries_ == 0 ? 0 : (static_cast<double>(queriesDone_) + doneOfQuery_) / static_cast<double>(queries_);
-  line_.show(place_ + "  " + elapsedText(elapsed) + "  " + countText(world_.digits, items_, "item") +
-             " measured, " + world_.digits(perSecond(items_, elapsed)) + " items/s" +
-             remainingText(done, elapsed));
+  line_.show(elapsedText(elapsed) + "  " + countText(world_.digits, items_, "item") + " measured, " +
+             world_.digits(perSecond(items_, elapsed)) + " items/s" + remainingText(done, elapsed) + "  " +
+             place_);
 }
 
 }  // namespace norvex

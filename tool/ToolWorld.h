@@ -12,6 +12,8 @@
 #include "platform/BackupSettings.h"
 #include "platform/ByteCountFormatter.h"
 #include "platform/Clock.h"
+#include "tool/AgentJob.h"
+#include "tool/AgentJournal.h"
 #include "tool/Console.h"
 #include "tool/FigureText.h"
 
@@ -31,7 +33,12 @@ struct ToolWorld {
   std::function<bool(const std::string& path)> isMountPoint;     // whether another volume begins there
   std::function<std::string(const std::string& path)> absolute;  // of a path as it was written
 
-  std::string dataHome;  // the user's data folder
+  std::string dataHome;      // the user's data folder
+  std::string messagesFile;  // of the diagnostic log, for when there is no journal
+  std::string disabledFile;  // an administrator's word against every report
+  AgentJournal& agentJournal;
+  AgentJob& agentJob;
+  std::function<bool()> wakeWaitingAgent;  // false when there is none
 
   // Set once the user wants to stop; read by what may take long.
   const std::atomic<bool>& cancelled;

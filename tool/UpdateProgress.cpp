@@ -31,11 +31,11 @@ void UpdateProgress::write(const CrawlFigures& figures) {
   const std::uint64_t items = figures.files + figures.folders;
   const double done =
       expectedItems_ == 0 ? 0 : static_cast<double>(items) / static_cast<double>(expectedItems_);
-  line_.show(safeText(volume_) + "  " + elapsedText(elapsed) + "  " +
-             countText(world_.digits, figures.files, "file") + ", " +
-             countText(world_.digits, figures.folders, "folder") + ", " +
+  // What matters stands first: a narrow terminal cuts the rest off.
+  line_.show(elapsedText(elapsed) + "  " + countText(world_.digits, items, "item") + ", " +
              world_.byteCounts.string(sumOf(figures.accumulatedSizes)) + ", " +
-             world_.digits(perSecond(items, elapsed)) + " items/s" + remainingText(done, elapsed));
+             world_.digits(perSecond(items, elapsed)) + " items/s" + remainingText(done, elapsed) + "  " +
+             safeText(volume_));
 }
 
 }  // namespace norvex

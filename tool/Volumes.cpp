@@ -2,6 +2,8 @@
 
 #include <sys/stat.h>
 
+#include <array>
+
 #include <algorithm>
 #include <string_view>
 
@@ -44,6 +46,16 @@ StoreFault missingStore(const StoreFolder& stores, const std::string& volume) {
   return {Kind::missing,
           "another file system is mounted there than the one that was indexed; index it with: " +
               updateCommand(volume)};
+}
+
+// Whether the index of the volume `around` has an item for the path, which lies on it.
+bool isIndexed(const StoreFolder& stores, const std::string& around, const std::string& path) {
+  const auto store = StoreReader::open(stores, around, StoreReader::Check::factsOnly);
+  if (!store) return false;
+  std::string_view below = std::string_view(path).substr(around.size());
+  if (below.starts_with('/')) below.remove_prefix(1);
+  const auto item = store.value()->itemAt(below);
+  return item && item.value().has_value();
 }
 
 StoreFault faultOf(const Error& error, const StoreFolder& stores, const std::string& volume) {
@@ -95,6 +107,48 @@ std::variant<std::unique_ptr<StoreReader>, StoreFault> openStore(const StoreFold
         "its first update is under way or was interrupted; finish it with: " + updateCommand(volume)};
   }
   return std::move(store).value();
+}
+
+const char* reasonText(StoreFault::Kind kind) {
+  // In the order of the kinds.
+  constexpr std::array<const char*, 6> kReasons{"missing", "unfinished", "damaged",
+                                                "tooNew",  "unreadable", "plainFolder"};
+  return kReasons[static_cast<std::size_t>(kind)];
+}
+
+StoreFault unfinishedFault(const std::string& volume) {
+  return {
+      StoreFault::Kind::unfinished,
+      "the agent reports nothing: the first update of this volume's index is under way or was interrupted; "
+      "finish it with: " +
+          updateCommand(volume)};
+}
+
+StoreFault plainFolderFault(const std::string& volumeAround) {
+  const std::string volume = safeText(volumeAround);
+  return {StoreFault::Kind::plainFolder,
+          "the agent reports nothing as long as this is among the included volumes: nothing is mounted "
+          "there, so it "
+          "is a plain folder of the volume " +
+              volume + ", which never gets an index of its own; mount its volume, or name " + volume +
+              " in its place as IncludedVolumes in chronel/backup.conf"};
+}
+
+std::vector<NotReadyVolume> volumesNotReady(const ToolWorld& world) {
+  std::vector<NotReadyVolume> notReady;
+  for (const std::string& volume : chosenVolumes(world, {}).value_or(std::vector<std::string>())) {
+    const std::string around = volumeOf(world, volume);
+    if (around != volume) {
+      // A path that no index knows is passed over by the agent.
+      if (isIndexed(world.stores, around, volume)) notReady.push_back({volume, plainFolderFault(around)});
+      continue;
+    }
+    const auto store = StoreReader::open(world.stores, volume, StoreReader::Check::factsOnly);
+    if (store && !store.value()->healthCheck()) notReady.push_back({volume, unfinishedFault(volume)});
+    if (!store && store.error().code != kStoreMissing)
+      notReady.push_back({volume, faultOf(store.error(), world.stores, volume)});
+  }
+  return notReady;
 }
 
 std::string updateCommand(const std::string& volume) {

@@ -12,11 +12,15 @@
 
 #include "index/MountPoints.h"
 #include "machine/MachinePlatform.h"
+#include "platform/linux/FileDiagnosticLog.h"
 #include "platform/linux/LocaleByteCountFormatter.h"
 #include "tool/CommandLine.h"
 #include "tool/Commands.h"
 #include "tool/ConsoleSystemLog.h"
 #include "tool/StopSignals.h"
+#include "tool/SystemdAgentJob.h"
+#include "tool/SystemdAgentJournal.h"
+#include "tool/WaitingAgent.h"
 
 namespace {
 
@@ -44,6 +48,8 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
   const Platform& roles = machine.roles();
   const ScopedPlatform installed(roles);
   const LocaleByteCountFormatter numbers;
+  SystemdAgentJournal journal;
+  SystemdAgentJob job(environment);
   ToolWorld world{.out = out,
                   .err = err,
                   .stores = machine.storeFolder(),
@@ -55,6 +61,11 @@ norvex::ExitStatus run(int argc, const char* const* argv) {
                   .isMountPoint = isMountPoint,
                   .absolute = absolutePath,
                   .dataHome = machine.folders().data,
+                  .messagesFile = FileDiagnosticLog::pathBelow(machine.folders().state),
+                  .disabledFile = "/etc/norvex/disabled",
+                  .agentJournal = journal,
+                  .agentJob = job,
+                  .wakeWaitingAgent = [] { return wakeWaitingAgent().has_value(); },
                   .cancelled = stopWanted()};
 
   ExitStatus status = runCommand(world, request);

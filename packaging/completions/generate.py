@@ -176,10 +176,11 @@ def fish(root, name):
              "    set -l words (commandline -opc)[2..-1]",
              "    set words (string match -v -- '-*' $words)",
              "    set -l wanted (string split -n ' ' -- $argv[1])",
-             "    test (count $words) -ge (count $wanted); or return 1",
-             "    set -q argv[2]; and test (count $words) -ne (count $wanted); and return 1",
-             "    test (count $wanted) -eq 0; and return 0",
-             "    test \"$words[1..(count $wanted)]\" = \"$wanted\"",
+             "    set -l depth (count $wanted)",
+             "    test (count $words) -ge $depth; or return 1",
+             "    set -q argv[2]; and test (count $words) -ne $depth; and return 1",
+             "    test $depth -eq 0; and return 0",
+             "    test \"$words[1..$depth]\" = \"$wanted\"",
              "end", "",
              f"complete -c {name} -f"]
     for command in root.everything():

@@ -15,6 +15,10 @@
 namespace norvex {
 namespace {
 
+// Below the state folder.
+constexpr const char* kFolder = "/norvex";
+constexpr const char* kFile = "/diagnostics.jsonl";
+
 constexpr mode_t kPrivateFileMode = 0600;
 
 // Another writer needs milliseconds. Whoever holds the lock for longer is stopped, and must not stop us.
@@ -56,8 +60,12 @@ ssize_t writeOnce(int file, const std::string& text) {
 
 }  // namespace
 
+std::string FileDiagnosticLog::pathBelow(const std::string& stateFolder) {
+  return stateFolder + kFolder + kFile;
+}
+
 FileDiagnosticLog::FileDiagnosticLog(const std::string& stateFolder, WallClock now)
-    : folder_(stateFolder + "/norvex"), path_(folder_ + "/diagnostics.jsonl"), now_(std::move(now)) {}
+    : folder_(stateFolder + kFolder), path_(pathBelow(stateFolder)), now_(std::move(now)) {}
 
 void FileDiagnosticLog::logWithKeys(std::string_view domain, int level,
                                     std::span<const DiagnosticPair> pairs) {

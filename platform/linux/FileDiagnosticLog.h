@@ -15,7 +15,10 @@ class FileDiagnosticLog final : public DiagnosticLog {
  public:
   using WallClock = std::function<std::chrono::system_clock::time_point()>;
 
-  // The file is norvex/diagnostics.jsonl below `stateFolder`. It and its folders are made when needed, for
+  // Where the file of a user with this state folder is.
+  static std::string pathBelow(const std::string& stateFolder);
+
+  // The file is pathBelow(`stateFolder`). It and its folders are made when needed, for
   // the user alone (0600, 0700).
   explicit FileDiagnosticLog(const std::string& stateFolder, WallClock now = std::chrono::system_clock::now);
 

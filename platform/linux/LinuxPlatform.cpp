@@ -3,6 +3,8 @@
 #include <string>
 #include <vector>
 
+#include "platform/linux/ControlGroup.h"
+
 namespace norvex {
 namespace {
 
@@ -18,8 +20,10 @@ LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environmen
       processControl_(std::vector<std::string>(argv, argv + argc)),
       userFolders_(folders_),
       backupSettings_({folders_.config, kSystemConfigFolder}, systemLog_),
-      diagnosticLog_(folders_.state),
+      diagnosticFile_(folders_.state),
+      diagnosticLog_(ownServiceUnit(environment), diagnosticFile_),
       jobRegistry_(environment),
+      memoryPressureSource_(MemoryPressurePlaces::ofProcess(environment), clock_),
       preferenceStore_(folders_.config + kOwnFolder),
       activityScheduler_(environment) {}
 

@@ -8,7 +8,9 @@
 #include "platform/linux/ConfBackupSettings.h"
 #include "platform/linux/Environment.h"
 #include "platform/linux/FileDiagnosticLog.h"
+#include "platform/linux/JournalDiagnosticLog.h"
 #include "platform/linux/JsonPreferenceStore.h"
+#include "platform/linux/KernelMemoryPressureSource.h"
 #include "platform/linux/LinuxActivityScheduler.h"
 #include "platform/linux/LinuxDirectoryEnumeration.h"
 #include "platform/linux/LinuxDirectoryListing.h"
@@ -21,7 +23,6 @@
 #include "platform/linux/MarkerFileInstallation.h"
 #include "platform/linux/Mpeg4MediaReader.h"
 #include "platform/linux/ProcStatusMemoryInfo.h"
-#include "platform/linux/SilentMemoryPressureSource.h"
 #include "platform/linux/StatvfsVolumeCatalog.h"
 #include "platform/linux/SteadyClock.h"
 #include "platform/linux/ThreadEventLoops.h"
@@ -55,7 +56,8 @@ class LinuxPlatform {
   ConfBackupSettings backupSettings_;
   LocaleByteCountFormatter byteCountFormatter_;
   SteadyClock clock_;
-  FileDiagnosticLog diagnosticLog_;
+  FileDiagnosticLog diagnosticFile_;
+  JournalDiagnosticLog diagnosticLog_;
   LinuxDirectoryEnumeration directoryEnumeration_;
   LinuxDirectoryListing directoryListing_;
   ThreadEventLoops eventLoops_;
@@ -63,7 +65,7 @@ class LinuxPlatform {
   MarkerFileInstallation installation_;
   UserManagerJobRegistry jobRegistry_;
   Mpeg4MediaReader mediaMetadataReader_;
-  SilentMemoryPressureSource memoryPressureSource_;
+  KernelMemoryPressureSource memoryPressureSource_;
   JsonPreferenceStore preferenceStore_;
   ProcStatusMemoryInfo processMemoryInfo_;
   LinuxResourceValues resourceValues_;

@@ -13,6 +13,7 @@ constexpr const char* kMasked = "masked";
 constexpr const char* kDisabled = "disabled";
 constexpr const char* kEnabled = "enabled";
 constexpr const char* kLoaded = "loaded";
+constexpr const char* kActive = "active";
 constexpr const char* kNotFound = "not-found";
 
 Error failure(int code, const std::string& unit, const std::string& what) {
@@ -36,12 +37,23 @@ Result<void> switchOff(UserManager& manager, const std::string& unit) {
 }
 
 Result<void> stopIfKnown(UserManager& manager, const std::string& unit) {
-  Result<void> outcome = manager.stop(unit);
+  Result<void> outcome = manager.stopAndWait(unit);
   if (!outcome && outcome.error().code == ENOENT) return {};  // what is not in memory does not run
   return outcome;
 }
 
+Result<void> startAndConfirm(UserManager& manager, const std::string& unit) {
+  if (Result<void> outcome = manager.startAndWait(unit); !outcome) return outcome;
+  const Result<UnitStatus> status = manager.status(unit);
+  if (!status) return status.error();
+  if (status.value().activeState == kActive) return {};
+  return failure(EBUSY, unit, "still " + status.value().activeState);
+}
+
 Result<void> confirmOff(UserManager& manager, const std::string& unit) {
+  const Result<UnitStatus> status = manager.status(unit);
+  if (!status) return status.error();
+  if (status.value().activeState == kActive) return failure(EBUSY, unit, "still active");
   const Result<std::string> state = manager.fileState(unit);
   if (!state) {
     // Disabling a unit whose file is a link takes the link away, and with it the unit.
@@ -107,7 +119,8 @@ Result<void> TimedJob::disable() {
   const Result<std::vector<std::string>> units = triggers();
   if (!units) return units.error();
   // All four steps are needed: a timer that is only masked runs on, and one that the manager has not read
-  // anew is started again.
+  // anew is started again. The stop has to be over by then: an order that is under way while the manager
+  // reads its units anew may come to nothing.
   Result<void> outcome =
       forEach(units.value(), [this](const std::string& unit) { return switchOff(manager_, unit); });
   if (outcome) {
@@ -138,7 +151,8 @@ Result<void> TimedJob::enable() {
   });
   if (outcome) outcome = manager_.reload();
   if (outcome)
-    outcome = forEach(unmasked.value(), [this](const std::string& unit) { return manager_.start(unit); });
+    outcome = forEach(unmasked.value(),
+                      [this](const std::string& unit) { return startAndConfirm(manager_, unit); });
   return outcome;
 }
 

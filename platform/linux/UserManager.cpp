@@ -1,12 +1,13 @@
 #include "platform/linux/UserManager.h"
 
-#include <systemd/sd-bus.h>
-
 #include <algorithm>
 #include <array>
 #include <cerrno>
 #include <string_view>
+#include <thread>
 #include <utility>
+
+#include "platform/linux/BusCall.h"
 
 namespace norvex {
 namespace {
@@ -18,6 +19,7 @@ using std::chrono::system_clock;
 constexpr const char* kManagerName = "org.freedesktop.systemd1";
 constexpr const char* kManagerPath = "/org/freedesktop/systemd1";
 constexpr const char* kManagerInterface = "org.freedesktop.systemd1.Manager";
+constexpr const char* kJobInterface = "org.freedesktop.systemd1.Job";
 constexpr const char* kUnitInterface = "org.freedesktop.systemd1.Unit";
 constexpr const char* kServiceInterface = "org.freedesktop.systemd1.Service";
 constexpr const char* kTimerInterface = "org.freedesktop.systemd1.Timer";
@@ -33,32 +35,7 @@ constexpr int kNotOnlyForThisBoot = 0;
 constexpr int kNotByForce = 0;
 constexpr const char* kReplacingOtherJobs = "replace";
 
-class BusError {
- public:
-  BusError() = default;
-  ~BusError() { ::sd_bus_error_free(&error_); }
-  BusError(const BusError&) = delete;
-  BusError& operator=(const BusError&) = delete;
-
-  sd_bus_error* address() { return &error_; }
-
-  // `result` is what the call returned: an errno value below zero. Where both ends are at a loss for words,
-  // the C library has some.
-  Error of(const std::string& asked, int result) const {
-    const char* said = error_.message;
-    Error error = systemError(-result);
-    error.description = asked + ": " + (said != nullptr && *said != '\0' ? said : error.description);
-    return error;
-  }
-
- private:
-  sd_bus_error error_ = SD_BUS_ERROR_NULL;
-};
-
-struct ReleaseMessage {
-  void operator()(sd_bus_message* message) const { ::sd_bus_message_unref(message); }
-};
-using Message = std::unique_ptr<sd_bus_message, ReleaseMessage>;
+constexpr std::chrono::milliseconds kOrderStep{5};
 
 std::string askedOf(const char* method, const std::string& unit) {
   return unit.empty() ? std::string(method) : method + (" of " + unit);
@@ -66,22 +43,22 @@ std::string askedOf(const char* method, const std::string& unit) {
 
 // Calls a method of the manager. `types` and the arguments are those of sd_bus_call_method(3).
 template <typename... Arguments>
-Result<Message> call(sd_bus* bus, const char* method, const std::string& unit, const char* types,
-                     Arguments... arguments) {
+Result<BusMessage> call(sd_bus* bus, const char* method, const std::string& unit, const char* types,
+                        Arguments... arguments) {
   BusError error;
   sd_bus_message* reply = nullptr;
   const int result = ::sd_bus_call_method(bus, kManagerName, kManagerPath, kManagerInterface, method,
                                           error.address(), &reply, types, arguments...);
   if (result < 0) return error.of(askedOf(method, unit), result);
-  return Message(reply);
+  return BusMessage(reply);
 }
 
-Result<void> withoutReply(const Result<Message>& outcome) {
+Result<void> withoutReply(const Result<BusMessage>& outcome) {
   if (!outcome) return outcome.error();
   return {};
 }
 
-Result<std::string> textIn(const Result<Message>& reply, const char* method, char type) {
+Result<std::string> textIn(const Result<BusMessage>& reply, const char* method, char type) {
   if (!reply) return reply.error();
   const char* text = nullptr;
   const int result = ::sd_bus_message_read_basic(reply.value().get(), type, &text);
@@ -107,14 +84,14 @@ class Properties {
   }
 
   std::string text(const char* interface, const char* name) {
-    const Message reply = read(interface, name, "s");
+    const BusMessage reply = read(interface, name, "s");
     const char* value = "";
     check(name, reply ? ::sd_bus_message_read_basic(reply.get(), SD_BUS_TYPE_STRING, &value) : 0);
     return value;
   }
 
   std::vector<std::string> names(const char* interface, const char* name) {
-    const Message reply = read(interface, name, "as");
+    const BusMessage reply = read(interface, name, "as");
     std::vector<std::string> names;
     if (!reply) return names;
     int result = ::sd_bus_message_enter_container(reply.get(), SD_BUS_TYPE_ARRAY, "s");
@@ -131,7 +108,7 @@ class Properties {
   template <typename Number>
   Number number(const char* interface, const char* name, char type) {
     const std::array<char, 2> signature{type, '\0'};
-    const Message reply = read(interface, name, signature.data());
+    const BusMessage reply = read(interface, name, signature.data());
     Number value{};
     check(name, reply ? ::sd_bus_message_read_basic(reply.get(), type, &value) : 0);
     return value;
@@ -150,13 +127,13 @@ class Properties {
 
  private:
   // Null after a failure.
-  Message read(const char* interface, const char* name, const char* type) {
+  BusMessage read(const char* interface, const char* name, const char* type) {
     if (failure_) return nullptr;
     BusError error;
     sd_bus_message* reply = nullptr;
     const int result = ::sd_bus_get_property(bus_, kManagerName, object_.c_str(), interface, name,
                                              error.address(), &reply, type);
-    Message owned(reply);
+    BusMessage owned(reply);
     if (result < 0) failure_ = error.of(askedOf(name, unit_), result);
     return owned;
   }
@@ -184,80 +161,13 @@ std::optional<system_clock::time_point> wallMomentOfMonotonic(std::uint64_t sinc
   return std::chrono::time_point_cast<system_clock::duration>(system_clock::now() + ahead);
 }
 
-// A byte outside of the set that an address may hold bare becomes %XX.
-std::string escapedForAddress(const std::string& path) {
-  constexpr const char* kDigits = "0123456789abcdef";
-  constexpr const char* kBare = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789-_/.*";
-  std::string text;
-  for (const char byte : path) {
-    if (std::char_traits<char>::find(kBare, std::char_traits<char>::length(kBare), byte) != nullptr) {
-      text += byte;
-      continue;
-    }
-    const auto value = static_cast<unsigned char>(byte);
-    text += {'%', kDigits[value / 16], kDigits[value % 16]};
-  }
-  return text;
-}
-
-std::optional<std::string> busAddress(const Environment& environment) {
-  std::optional<std::string> address = valueOf(environment, "DBUS_SESSION_BUS_ADDRESS");
-  if (address && !address->empty()) return address;
-  const std::optional<std::string> folder = valueOf(environment, "XDG_RUNTIME_DIR");
-  if (!folder || !folder->starts_with('/')) return std::nullopt;
-  return "unix:path=" + escapedForAddress(*folder + "/bus");
-}
-
-int startConnecting(sd_bus* bus, const std::string& address) {
-  int result = ::sd_bus_set_address(bus, address.c_str());
-  if (result >= 0) result = ::sd_bus_set_bus_client(bus, 1);
-  if (result >= 0) result = ::sd_bus_start(bus);
-  return result;
-}
-
-// The library's own limit for the time until the bus has let us in is a minute and a half, and cannot be set.
-int waitUntilConnected(sd_bus* bus, microseconds limit) {
-  const auto deadline = steady_clock::now() + limit;
-  while (true) {
-    int result = ::sd_bus_is_ready(bus);
-    if (result != 0) return result;
-    result = ::sd_bus_process(bus, nullptr);
-    if (result < 0) return result;
-    if (result > 0) continue;
-    const auto left = std::chrono::duration_cast<microseconds>(deadline - steady_clock::now());
-    if (left <= microseconds::zero()) return -ETIMEDOUT;
-    result = ::sd_bus_wait(bus, static_cast<std::uint64_t>(left.count()));
-    if (result < 0 && result != -EINTR) return result;
-  }
-}
-
 }  // namespace
-
-void UserManager::CloseBus::operator()(sd_bus* bus) const {
-  // Without writing what is left: that could wait for a bus that does not read.
-  ::sd_bus_close_unref(bus);
-}
-
-UserManager::UserManager(Bus bus) : bus_(std::move(bus)) {}
-UserManager::UserManager(UserManager&&) noexcept = default;
-UserManager& UserManager::operator=(UserManager&&) noexcept = default;
-UserManager::~UserManager() = default;
 
 Result<UserManager> UserManager::connect(const Environment& environment,
                                          std::chrono::milliseconds callLimit) {
-  constexpr const char* kAsked = "Session bus";
-  const std::optional<std::string> address = busAddress(environment);
-  if (!address) return BusError().of(kAsked, -ENOMEDIUM);
-  sd_bus* made = nullptr;
-  int result = ::sd_bus_new(&made);
-  if (result < 0) return BusError().of(kAsked, result);
-  Bus bus(made);
-  const microseconds limit = callLimit;
-  result = ::sd_bus_set_method_call_timeout(bus.get(), static_cast<std::uint64_t>(limit.count()));
-  if (result >= 0) result = startConnecting(bus.get(), *address);
-  if (result >= 0) result = waitUntilConnected(bus.get(), limit);
-  if (result < 0) return BusError().of(kAsked, result);
-  return UserManager(std::move(bus));
+  Result<BusConnection> bus = connectToSessionBus(environment, callLimit);
+  if (!bus) return bus.error();
+  return UserManager(std::move(bus).value(), callLimit);
 }
 
 Result<UnitStatus> UserManager::status(const std::string& unit) {
@@ -322,7 +232,7 @@ Result<std::vector<std::string>> UserManager::unitFiles(const std::vector<std::s
   sd_bus_message* made = nullptr;
   int result = ::sd_bus_message_new_method_call(bus_.get(), &made, kManagerName, kManagerPath,
                                                 kManagerInterface, kMethod);
-  const Message question(made);
+  const BusMessage question(made);
   if (result >= 0) result = ::sd_bus_message_append(made, "as", 0);  // files of any state
   if (result >= 0) result = ::sd_bus_message_append_strv(made, patternList.data());
   if (result < 0) return BusError().of(kMethod, result);
@@ -330,7 +240,7 @@ Result<std::vector<std::string>> UserManager::unitFiles(const std::vector<std::s
   BusError error;
   sd_bus_message* received = nullptr;
   result = ::sd_bus_call(bus_.get(), made, 0, error.address(), &received);
-  const Message reply(received);
+  const BusMessage reply(received);
   if (result >= 0) result = ::sd_bus_message_enter_container(received, SD_BUS_TYPE_ARRAY, "(ss)");
   std::vector<std::string> names;
   const char* path = nullptr;
@@ -342,6 +252,22 @@ Result<std::vector<std::string>> UserManager::unitFiles(const std::vector<std::s
   if (result < 0) return error.of(kMethod, result);
   std::sort(names.begin(), names.end());
   return names;
+}
+
+Result<std::vector<std::string>> UserManager::environment() {
+  constexpr const char* kEnvironment = "Environment";
+  BusError error;
+  sd_bus_message* reply = nullptr;
+  int result = ::sd_bus_get_property(bus_.get(), kManagerName, kManagerPath, kManagerInterface, kEnvironment,
+                                     error.address(), &reply, "as");
+  const BusMessage owned(reply);
+  if (result >= 0) result = ::sd_bus_message_enter_container(reply, SD_BUS_TYPE_ARRAY, "s");
+  std::vector<std::string> variables;
+  const char* variable = nullptr;
+  while (result >= 0 && (result = ::sd_bus_message_read_basic(reply, SD_BUS_TYPE_STRING, &variable)) > 0)
+    variables.emplace_back(variable);
+  if (result < 0) return error.of(kEnvironment, result);
+  return variables;
 }
 
 Result<void> UserManager::mask(const std::string& unit) {
@@ -373,6 +299,34 @@ Result<void> UserManager::start(const std::string& unit) {
 
 Result<void> UserManager::stop(const std::string& unit) {
   return withoutReply(call(bus_.get(), "StopUnit", unit, "ss", unit.c_str(), kReplacingOtherJobs));
+}
+
+Result<void> UserManager::startAndWait(const std::string& unit) {
+  return orderAndWait("StartUnit", unit);
+}
+
+Result<void> UserManager::stopAndWait(const std::string& unit) {
+  return orderAndWait("StopUnit", unit);
+}
+
+Result<void> UserManager::orderAndWait(const char* method, const std::string& unit) {
+  const Result<std::string> job =
+      textIn(call(bus_.get(), method, unit, "ss", unit.c_str(), kReplacingOtherJobs), method,
+             SD_BUS_TYPE_OBJECT_PATH);
+  if (!job) return job.error();
+  // The manager has an object for the order until it is done with it.
+  const auto deadline = steady_clock::now() + callLimit_;
+  while (true) {
+    BusError error;
+    sd_bus_message* reply = nullptr;
+    const int result = ::sd_bus_get_property(bus_.get(), kManagerName, job.value().c_str(), kJobInterface,
+                                             "State", error.address(), &reply, "s");
+    const BusMessage owned(reply);
+    if (::sd_bus_error_has_name(error.address(), SD_BUS_ERROR_UNKNOWN_OBJECT) > 0) return {};
+    if (result < 0) return error.of(askedOf(method, unit), result);
+    if (steady_clock::now() >= deadline) return BusError().of(askedOf(method, unit), -ETIMEDOUT);
+    std::this_thread::sleep_for(kOrderStep);
+  }
 }
 
 }  // namespace norvex

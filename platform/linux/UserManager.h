@@ -10,15 +10,14 @@
 
 #include <chrono>
 #include <cstdint>
-#include <memory>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "platform/Result.h"
 #include "platform/linux/Environment.h"
-
-struct sd_bus;
+#include "platform/linux/SessionBus.h"
 
 namespace norvex {
 
@@ -57,10 +56,6 @@ class UserManager {
   static Result<UserManager> connect(const Environment& environment,
                                      std::chrono::milliseconds callLimit = kCallLimit);
 
-  UserManager(UserManager&&) noexcept;
-  UserManager& operator=(UserManager&&) noexcept;
-  ~UserManager();
-
   // A unit that there is no file of is no failure: its loadState is "not-found".
   Result<UnitStatus> status(const std::string& unit);
 
@@ -80,6 +75,9 @@ class UserManager {
   // The names of the unit files, masks included, that match one of the shell patterns, in order.
   Result<std::vector<std::string>> unitFiles(const std::vector<std::string>& patterns);
 
+  // The variables that the manager passes on to what it starts, each "NAME=value".
+  Result<std::vector<std::string>> environment();
+
   // For this user, on the disk. What is in memory follows with reload(). A mask is set for any name, also for
   // one that no unit has: ask first. It fails with EEXIST where the unit's own file stands in its place.
   Result<void> mask(const std::string& unit);
@@ -90,19 +88,22 @@ class UserManager {
   // Reads all unit files anew.
   Result<void> reload();
 
-  // Returns when the manager has taken the order; it is carried out after that.
+  // Return when the manager has taken the order; it is carried out after that.
   Result<void> start(const std::string& unit);
   Result<void> stop(const std::string& unit);
 
+  // Return when the order has been carried out, or has come to nothing; which of them, status() tells.
+  // ETIMEDOUT when that takes longer than the limit; the manager goes on with it then.
+  Result<void> startAndWait(const std::string& unit);
+  Result<void> stopAndWait(const std::string& unit);
+
  private:
-  struct CloseBus {
-    void operator()(sd_bus* bus) const;
-  };
-  using Bus = std::unique_ptr<sd_bus, CloseBus>;
+  UserManager(BusConnection bus, std::chrono::milliseconds callLimit)
+      : bus_(std::move(bus)), callLimit_(callLimit) {}
+  Result<void> orderAndWait(const char* method, const std::string& unit);
 
-  explicit UserManager(Bus bus);
-
-  Bus bus_;
+  BusConnection bus_;
+  std::chrono::milliseconds callLimit_;
 };
 
 }  // namespace norvex

@@ -71,6 +71,14 @@ TEST(CommandLine, HelpOfEveryCommandHasAnExample) {
                                             {"index", "query", "--help"},
                                             {"index", "show", "--help"},
                                             {"preview", "--help"},
+                                            {"agent", "--help"},
+                                            {"agent", "status", "--help"},
+                                            {"agent", "run", "--help"},
+                                            {"agent", "enable", "--help"},
+                                            {"agent", "disable", "--help"},
+                                            {"doctor", "--help"},
+                                            {"log", "--help"},
+                                            {"show", "--help"},
                                             {"summary", "--help"}};
   for (const auto& arguments : cases) {
     const Parsed parsed = parse(arguments);

@@ -65,7 +65,7 @@ TEST(IndexUpdate, ShowsProgressOnATerminalAndWipesItAway) {
   terminal.width = 200;
   ToolTestWorld tool(terminal);
   runIndexUpdate(tool.world, {{tool.volume()}, false});
-  EXPECT_EQ(tool.errors(), "\r\x1b[2K<volume>  0:00  0 files, 0 folders, 0 bytes, 0 items/s\r\x1b[2K");
+  EXPECT_EQ(tool.errors(), "\r\x1b[2K0:00  0 items, 0 bytes, 0 items/s  <volume>\r\x1b[2K");
 }
 
 }  // namespace

@@ -1,5 +1,8 @@
 #include "MeasuredWorld.h"
 
+#include <time.h>
+
+#include <cstdlib>
 #include <vector>
 
 namespace norvex {
@@ -31,14 +34,21 @@ MeasuredWorld::MeasuredWorld(const ConsoleStyle& style)
             .err = err_,
             .stores = stores_,
             .backupSettings = backupSettings,
-            .byteCounts = byteCountFormatter,
+            .byteCounts = byteCounts_,
             .digits = grouped,
             .clock = clock,
             .secondsSince1970 = [] { return kNow; },
             .isMountPoint = [](const std::string& path) { return path == "/" || path == kOtherDisk; },
             .absolute = [](const std::string& path) { return path; },
             .dataHome = cache_.path("data"),
+            .messagesFile = cache_.path("diagnostics.jsonl"),
+            .disabledFile = "/etc/norvex/disabled",
+            .agentJournal = journal,
+            .agentJob = job,
+            .wakeWaitingAgent = [this] { return agentWaits; },
             .cancelled = cancelled_} {
+  ::setenv("TZ", "UTC0", 1);
+  ::tzset();
   fillStartupDisk();
   fillOtherDisk();
   backupSettings.content->automaticBackupsEnabled = true;

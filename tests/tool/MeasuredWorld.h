@@ -7,7 +7,10 @@
 #include <sstream>
 #include <string>
 
+#include "InMemoryAgentJob.h"
+#include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
+#include "platform/linux/LocaleByteCountFormatter.h"
 #include "tests/scanner/ScanWorld.h"
 #include "tests/support/TreeOnDisk.h"
 #include "tool/ToolWorld.h"
@@ -24,6 +27,9 @@ class MeasuredWorld : public ScanWorld {
   std::string output() const { return outText_.str(); }
   std::string errors() const { return errText_.str(); }
 
+  // A folder of the test's own.
+  const ondisk::TreeOnDisk& folder() const { return cache_; }
+
  private:
   void fillStartupDisk();
   void fillOtherDisk();
@@ -32,9 +38,13 @@ class MeasuredWorld : public ScanWorld {
   StoreFolder stores_{cache_.path()};
   std::ostringstream outText_, errText_;
   Console out_, err_;
+  const LocaleByteCountFormatter byteCounts_{"C"};
   std::atomic<bool> cancelled_{false};
 
  public:
+  InMemoryAgentJournal journal;
+  InMemoryAgentJob job;
+  bool agentWaits = false;  // for the word to run
   ToolWorld world;
 };
 

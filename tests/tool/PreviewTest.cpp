@@ -139,7 +139,7 @@ TEST(Preview, ShowsProgressOnATerminalAndTakesItAway) {
   MeasuredWorld machine({.isTerminal = true, .width = 200});
   runPreview(machine.world, kText);
   EXPECT_THAT(machine.errors(),
-              ::testing::StartsWith("\r\x1b[2KFolders of your own  0:00  0 items measured"));
+              ::testing::StartsWith("\r\x1b[2K0:00  0 items measured, 0 items/s  folders of your own"));
   EXPECT_THAT(machine.errors(), ::testing::EndsWith("\r\x1b[2K"));
 }
 

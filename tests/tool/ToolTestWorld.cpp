@@ -64,6 +64,11 @@ ToolTestWorld::ToolTestWorld(const ConsoleStyle& style)
             [this](const std::string& path) { return path == volume(); },
             [](const std::string& path) { return path; },
             cache.path("data"),
+            cache.path("diagnostics.jsonl"),
+            cache.path("disabled"),
+            journal,
+            job,
+            [] { return false; },
             cancelled} {
   ::setenv("TZ", "UTC0", 1);
   ::tzset();

@@ -7,6 +7,8 @@
 #include <string>
 #include <vector>
 
+#include "InMemoryAgentJob.h"
+#include "InMemoryAgentJournal.h"
 #include "index/StoreFolder.h"
 #include "tests/support/CallJournal.h"
 #include "tests/support/InMemoryBackupSettings.h"
@@ -49,6 +51,8 @@ class ToolTestWorld {
   InMemoryBackupSettings settings{calls};
   InMemoryByteCountFormatter byteCounts;
   InMemoryClock clock;
+  InMemoryAgentJournal journal;
+  InMemoryAgentJob job;
   std::atomic<bool> cancelled{false};
   std::ostringstream outText, errText;
   Console out, err;

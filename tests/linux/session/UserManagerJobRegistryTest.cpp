@@ -40,14 +40,14 @@ std::string startedJob(const std::string& name, const std::string& folder) {
   UserManager manager = sessionManager();
   EXPECT_TRUE(manager.enable(timerOf(label)));
   EXPECT_TRUE(manager.reload());
-  EXPECT_TRUE(manager.start(timerOf(label)));
+  EXPECT_TRUE(manager.startAndWait(timerOf(label)));
   EXPECT_EQ(activeStateOf(timerOf(label)), "active");
   return label;
 }
 
 void expectOff(const std::string& label, const std::string& fileState) {
   EXPECT_EQ(fileStateOf(timerOf(label)), fileState);
-  EXPECT_TRUE(eventually([&] { return activeStateOf(timerOf(label)) == "inactive"; }));
+  EXPECT_EQ(activeStateOf(timerOf(label)), "inactive");
 }
 
 TEST(UserManagerJobRegistry, AJobThatIsEnabledForAllUsersGoesOffAndStaysOffUntilItIsSwitchedOn) {
@@ -119,7 +119,7 @@ TEST(UserManagerJobRegistry, ATimerThatIsLinkedFromElsewhereIsUnlinkedAndItsFile
   EXPECT_EQ(described(disable(label)), "success");
   EXPECT_FALSE(std::filesystem::exists(unitsOfUser() + "/" + timerOf(label)));
   EXPECT_TRUE(std::filesystem::is_regular_file(timer));
-  EXPECT_TRUE(eventually([&] { return activeStateOf(timerOf(label)) == "inactive"; }));
+  EXPECT_EQ(activeStateOf(timerOf(label)), "inactive");
   std::filesystem::remove_all(elsewhere);
 }
 

@@ -19,7 +19,7 @@ TEST(UserManager, TellsWhatTriggersAService) {
   const std::string label = installJob("Triggered", unitsOfPackages());
   UserManager manager = sessionManager();
   EXPECT_EQ(manager.unitStartedBy(timerOf(label)).value(), label + ".service");
-  ASSERT_TRUE(manager.start(timerOf(label)));
+  ASSERT_TRUE(manager.startAndWait(timerOf(label)));
   EXPECT_THAT(manager.triggersOf(label + ".service").value(), ElementsAre(timerOf(label)));
   EXPECT_THAT(manager.triggersOf("dbus.socket").value(), ElementsAre());
 }
@@ -64,7 +64,7 @@ TEST(UserManager, TellsWhenAServiceRanAndHowItEnded) {
     const std::string label = installJob(row.name, unitsOfPackages(), row.command);
     const std::string service = label + ".service";
     UserManager manager = sessionManager();
-    ASSERT_TRUE(manager.start(timerOf(label)));
+    ASSERT_TRUE(manager.startAndWait(timerOf(label)));
     EXPECT_FALSE(manager.lastRun(service).value().started) << row.name;
     const auto before = system_clock::now();
     ASSERT_TRUE(manager.start(service)) << row.name;
@@ -84,8 +84,7 @@ TEST(UserManager, TellsWhenATimerWillTrigger) {
   UserManager manager = sessionManager();
   EXPECT_FALSE(manager.momentsOf(timer).value().next);
   const auto before = system_clock::now();
-  ASSERT_TRUE(manager.start(timer));
-  ASSERT_TRUE(eventually([&] { return manager.momentsOf(timer).value().next.has_value(); }));
+  ASSERT_TRUE(manager.startAndWait(timer));
   const TimerMoments moments = manager.momentsOf(timer).value();
   EXPECT_FALSE(moments.last);
   EXPECT_GT(*moments.next, before + std::chrono::minutes(59));

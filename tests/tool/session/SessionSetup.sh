@@ -1,0 +1,1 @@
+# Nothing has to be there before the session begins.
