@@ -12,8 +12,8 @@
 #include <string_view>
 
 #include "index/ContentTypes.h"
+#include "platform/FileDescriptor.h"
 #include "platform/Platform.h"
-#include "platform/linux/FileDescriptor.h"
 #include "tool/AgentSwitch.h"
 #include "tool/FigureText.h"
 #include "tool/SafeText.h"

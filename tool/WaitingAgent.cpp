@@ -11,7 +11,7 @@
 #include <string>
 #include <string_view>
 
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
 namespace norvex {

@@ -7,9 +7,9 @@
 #include <thread>
 #include <utility>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/Base64.h"
 #include "platform/linux/ControlGroup.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PolledPressure.h"
 #include "platform/linux/PressureTriggers.h"
 

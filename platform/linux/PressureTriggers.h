@@ -6,9 +6,9 @@
 #include <string>
 #include <vector>
 
+#include "platform/FileDescriptor.h"
 #include "platform/MemoryPressureSource.h"
 #include "platform/Result.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PressureSensor.h"
 
 namespace norvex {

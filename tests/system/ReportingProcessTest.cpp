@@ -12,7 +12,7 @@
 #include <thread>
 
 #include "AgentWorld.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/IoPriority.h"
 
 namespace norvex {

@@ -7,7 +7,7 @@
 #include <semaphore>
 
 #include "ScratchFolder.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/KernelMemoryPressureSource.h"
 #include "tests/support/InMemoryClock.h"
 

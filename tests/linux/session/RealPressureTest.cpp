@@ -13,7 +13,7 @@
 #include <semaphore>
 
 #include "Session.h"
-#include "platform/linux/FileDescriptor.h"
+#include "platform/FileDescriptor.h"
 #include "platform/linux/KernelMemoryPressureSource.h"
 #include "platform/linux/PressureTriggers.h"
 #include "platform/linux/SteadyClock.h"
