@@ -23,6 +23,7 @@ LinuxPlatform::LinuxPlatform(int argc, const char* const* argv, const Environmen
       diagnosticFile_(folders_.state),
       diagnosticLog_(ownServiceUnit(environment), diagnosticFile_),
       jobRegistry_(environment),
+      memoryPressureSource_(MemoryPressurePlaces::ofProcess(environment), clock_),
       preferenceStore_(folders_.config + kOwnFolder),
       activityScheduler_(environment) {}
 

@@ -10,6 +10,7 @@
 #include "platform/linux/FileDiagnosticLog.h"
 #include "platform/linux/JournalDiagnosticLog.h"
 #include "platform/linux/JsonPreferenceStore.h"
+#include "platform/linux/KernelMemoryPressureSource.h"
 #include "platform/linux/LinuxActivityScheduler.h"
 #include "platform/linux/LinuxDirectoryEnumeration.h"
 #include "platform/linux/LinuxDirectoryListing.h"
@@ -22,7 +23,6 @@
 #include "platform/linux/MarkerFileInstallation.h"
 #include "platform/linux/Mpeg4MediaReader.h"
 #include "platform/linux/ProcStatusMemoryInfo.h"
-#include "platform/linux/SilentMemoryPressureSource.h"
 #include "platform/linux/StatvfsVolumeCatalog.h"
 #include "platform/linux/SteadyClock.h"
 #include "platform/linux/ThreadEventLoops.h"
@@ -65,7 +65,7 @@ class LinuxPlatform {
   MarkerFileInstallation installation_;
   UserManagerJobRegistry jobRegistry_;
   Mpeg4MediaReader mediaMetadataReader_;
-  SilentMemoryPressureSource memoryPressureSource_;
+  KernelMemoryPressureSource memoryPressureSource_;
   JsonPreferenceStore preferenceStore_;
   ProcStatusMemoryInfo processMemoryInfo_;
   LinuxResourceValues resourceValues_;

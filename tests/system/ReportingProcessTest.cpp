@@ -1,0 +1,115 @@
+// The real program while it reports: who may end it, and how it competes for the disk.
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/file.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <fstream>
+#include <string>
+#include <thread>
+
+#include "AgentWorld.h"
+#include "platform/linux/FileDescriptor.h"
+#include "platform/linux/IoPriority.h"
+
+namespace norvex {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr int kEndingSignals[] = {SIGTERM, SIGINT, SIGHUP};
+
+// The lock that the agent waits for (two seconds a message) before it writes one: the time in which a test
+// can look at it.
+class HeldMessages {
+ public:
+  explicit HeldMessages(const AgentWorld& world) {
+    AgentWorld::write(world.messagesFile(), "");
+    file_ = FileDescriptor(::open(world.messagesFile().c_str(), O_RDONLY | O_CLOEXEC));
+    EXPECT_EQ(::flock(file_.number(), LOCK_EX), 0);
+  }
+  void release() { file_ = FileDescriptor(); }
+
+ private:
+  FileDescriptor file_;
+};
+
+// The signals that the process ignores: of a line of its status file.
+std::uint64_t ignoredSignals(pid_t process) {
+  std::ifstream status("/proc/" + std::to_string(process) + "/status");
+  for (std::string line; std::getline(status, line);) {
+    if (line.starts_with("SigIgn:")) return std::stoull(line.substr(line.find('\t')), nullptr, 16);
+  }
+  return 0;
+}
+
+bool ignores(pid_t process, int signal) {
+  return (ignoredSignals(process) >> (signal - 1) & 1) != 0;
+}
+
+// False when the process has ended before it came to it.
+bool waitUntilItReports(pid_t process) {
+  while (!ignores(process, SIGTERM)) {
+    siginfo_t end{};
+    if (::waitid(P_PID, static_cast<id_t>(process), &end, WEXITED | WNOHANG | WNOWAIT) != 0) return false;
+    if (end.si_pid != 0) return false;
+    std::this_thread::yield();
+  }
+  return true;
+}
+
+TEST(ReportingProcess, IsNotEndedBetweenTheFirstMessageAndTheRecordOfTheRelease) {
+  AgentWorld world;
+  HeldMessages messages(world);
+  const pid_t process = world.start({"--force"});
+  ASSERT_TRUE(waitUntilItReports(process));
+  for (const int signal : kEndingSignals) {
+    EXPECT_TRUE(ignores(process, signal)) << signal;
+    EXPECT_EQ(::kill(process, signal), 0);
+  }
+  messages.release();
+  EXPECT_EQ(AgentWorld::wait(process), 0);
+  EXPECT_EQ(world.messages().size(), 2U);
+  EXPECT_NE(AgentWorld::read(world.preferenceFile()).value_or("").find("LastVersionRun"), std::string::npos);
+}
+
+// Some systems let nobody change it.
+bool mayBeIdle() {
+  long status = 0;
+  std::thread([&] {
+    status = ::syscall(SYS_ioprio_set, kIoPriorityOfProcess, 0, ioPriority(kIoClassIdle));
+  }).join();
+  return status == 0;
+}
+
+TEST(ReportingProcess, HasTheLowestDiskPriorityOnAllOfItsThreads) {
+  if (!mayBeIdle()) GTEST_SKIP() << "the system forbids ioprio_set";
+  AgentWorld world;
+  // Started by a signal it has more threads than one: the scheduler's, the watchdog's.
+  world.beforeExec = [] {
+    sigset_t run;
+    sigemptyset(&run);
+    sigaddset(&run, SIGUSR1);
+    sigprocmask(SIG_BLOCK, &run, nullptr);
+    kill(getpid(), SIGUSR1);
+  };
+  HeldMessages messages(world);
+  const pid_t process = world.start({});
+  ASSERT_TRUE(waitUntilItReports(process));
+  int threads = 0;
+  for (const auto& entry : fs::directory_iterator("/proc/" + std::to_string(process) + "/task")) {
+    const int thread = std::stoi(entry.path().filename());
+    const long priority = ::syscall(SYS_ioprio_get, kIoPriorityOfProcess, thread);
+    EXPECT_EQ(ioClassOf(static_cast<int>(priority)), kIoClassIdle) << thread;
+    ++threads;
+  }
+  EXPECT_GE(threads, 3);
+  messages.release();
+  EXPECT_EQ(AgentWorld::wait(process), 0);
+}
+
+}  // namespace
+}  // namespace norvex
