@@ -18,7 +18,9 @@ struct CommandRunner {
   ExitStatus operator()(const AgentRunRequest& request) const { return runAgentRun(world, request); }
   ExitStatus operator()(const AgentEnableRequest& request) const { return runAgentEnable(world, request); }
   ExitStatus operator()(const AgentDisableRequest& request) const { return runAgentDisable(world, request); }
-  ExitStatus operator()(const DoctorRequest& request) const { return runDoctor(world, request); }
+  ExitStatus operator()(const DoctorRequest& request) const {
+    return runDoctor(world, request, DoctorPlaces::ofThisMachine());
+  }
   ExitStatus operator()(const LogRequest& request) const { return runLog(world, request); }
   ExitStatus operator()(const PreviewRequest& request) const { return runPreview(world, request); }
   ExitStatus operator()(const ShowRequest& request) const { return runShow(world, request); }

@@ -1,6 +1,5 @@
 #include "tool/Doctor.h"
 
-#include <fcntl.h>
 #include <sys/socket.h>
 #include <sys/un.h>
 #include <unistd.h>
@@ -9,11 +8,12 @@
 #include <array>
 #include <cerrno>
 #include <cstring>
-#include <string_view>
 
 #include "index/ContentTypes.h"
 #include "platform/FileDescriptor.h"
 #include "platform/Platform.h"
+#include "platform/linux/KernelMemoryPressureSource.h"
+#include "platform/linux/PressureTriggers.h"
 #include "tool/AgentSwitch.h"
 #include "tool/FigureText.h"
 #include "tool/SafeText.h"
@@ -85,22 +85,18 @@ Finding serviceManager(const ToolWorld& world) {
           ""};
 }
 
-// A trigger as the agent asks for one; it goes with the descriptor.
-int pressureTriggerAt(const std::string& path) {
-  constexpr std::string_view kTrigger("some 150000 2000000\0", 20);
-  const FileDescriptor file(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
-  if (!file) return errno;
-  return ::write(file.number(), kTrigger.data(), kTrigger.size()) < 0 ? errno : 0;
-}
-
 Finding memoryPressure(const DoctorPlaces& places) {
   const std::string role = "Memory pressure";
-  const int error = pressureTriggerAt(places.memoryPressure);
-  if (error == 0) return {role, State::works, "triggers of the kernel at " + places.memoryPressure, ""};
+  std::string refused;
+  for (const std::string& file : places.pressureFiles) {
+    const auto triggers = PressureTriggers::onFile(file, {.warning = true, .critical = true});
+    if (triggers) return {role, State::works, "triggers of the kernel at " + safeText(file), ""};
+    refused += (refused.empty() ? "" : ", ") + safeText(file) + ": " + triggers.error().description;
+  }
   return {role, State::fallsBack,
-          "no trigger at " + places.memoryPressure + " (" + reasonOf(error) +
-              "); the agent looks at its memory every few seconds",
-          error == ENOENT || error == EOPNOTSUPP ? "boot the kernel with psi=1, if it can" : ""};
+          "no trigger of the kernel (" + (refused.empty() ? "it has no files of pressure" : refused) +
+              "); the agent looks every few seconds how much memory is left",
+          "boot the kernel with psi=1, if it can"};
 }
 
 Finding contentTypes(const ToolWorld& world) {
@@ -190,6 +186,12 @@ Finding volumeFinding(const ToolWorld& world, const std::string& volume,
 }
 
 }  // namespace
+
+DoctorPlaces DoctorPlaces::ofThisMachine() {
+  DoctorPlaces places;
+  places.pressureFiles = MemoryPressurePlaces::ofProcess(processEnvironment()).pressureFiles;
+  return places;
+}
 
 std::vector<Finding> examine(const ToolWorld& world, const DoctorPlaces& places) {
   std::vector<Finding> findings{diagnosticLog(world, places),

@@ -30,7 +30,9 @@ struct Finding {
 struct DoctorPlaces {
   std::string journalSocket = kJournalSocket;
   std::string systemLogSocket = kSystemLogSocket;
-  std::string memoryPressure = "/proc/pressure/memory";
+  std::vector<std::string> pressureFiles;  // of memory, best first
+
+  static DoctorPlaces ofThisMachine();
 };
 
 // Every finding, in a fixed order of roles. Changes nothing.

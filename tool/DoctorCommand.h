@@ -12,6 +12,6 @@ struct DoctorRequest {
 };
 
 // Fails when something is broken; what has a substitute is no failure.
-ExitStatus runDoctor(ToolWorld& world, const DoctorRequest& request, const DoctorPlaces& places = {});
+ExitStatus runDoctor(ToolWorld& world, const DoctorRequest& request, const DoctorPlaces& places);
 
 }  // namespace norvex

@@ -2,6 +2,8 @@
 // reports.
 #include <gtest/gtest.h>
 
+#include <unistd.h>
+
 #include <nlohmann/json.hpp>
 
 #include "AgentWorld.h"
@@ -62,6 +64,25 @@ TEST(PreviewRun, ShowsWhatTheAgentThenReportsByteForByteAndSendsNothingItself) {
   ASSERT_EQ(status, 0) << "70: the preview has left a message or the mark of a run";
   ASSERT_EQ(world.messages().size(), 2U);
   EXPECT_EQ(previewed(preview), reported(world));
+}
+
+TEST(LogRun, ShowsWhatTheAgentHasReported) {
+  AgentWorld world;
+  ASSERT_EQ(world.run({"--force"}), 0);
+  const fs::path log = world.root() / "log.json";
+  const pid_t process = fork();
+  if (process == 0) _exit(runTool(world, {"log", "--json"}, log));
+  ASSERT_EQ(AgentWorld::wait(process), 0);
+  json shown = json::array();
+  const json document = json::parse(AgentWorld::read(log).value_or(""));
+  for (json message : document["messages"]) {
+    EXPECT_EQ(message["source"], "file");
+    message.erase("time");
+    message.erase("source");
+    shown.push_back(std::move(message));
+  }
+  EXPECT_EQ(shown, reported(world));
+  EXPECT_EQ(shown.size(), 2U);
 }
 
 }  // namespace

@@ -13,7 +13,7 @@ namespace {
 using ::testing::HasSubstr;
 using State = Finding::State;
 
-const DoctorPlaces kNowhere{"/nowhere/journal", "/nowhere/log", "/nowhere/pressure"};
+const DoctorPlaces kNowhere{"/nowhere/journal", "/nowhere/log", {"/nowhere/pressure"}};
 
 Finding findingOf(const std::vector<Finding>& findings, const std::string& role) {
   for (const Finding& finding : findings) {
