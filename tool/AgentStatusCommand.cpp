@@ -21,8 +21,8 @@ namespace {
 constexpr std::int64_t kMicroseconds = 1'000'000;
 constexpr int kErrorPriority = 3;
 constexpr std::size_t kMostLines = 10;
-// How far back lines are looked for when nothing tells when the last run was.
-constexpr std::int64_t kRecent = 7 * 24 * 3600;
+// A week: how far back lines are looked for when nothing tells when the last run was.
+constexpr std::int64_t kRecent = 604'800;
 
 struct AgentStatus {
   bool hasReported = false;

@@ -24,8 +24,8 @@ namespace {
 
 using State = Finding::State;
 
-// An index that is older than this tells of a volume as it is no more.
-constexpr std::int64_t kStale = 14 * 24 * 3600;
+// Two weeks: an index that is older tells of a volume as it is no more.
+constexpr std::int64_t kStale = 1'209'600;
 
 // Whether somebody listens at a datagram socket: 0, or the errno value. Nothing is sent.
 int listenerAt(const std::string& path) {
