@@ -3,10 +3,12 @@
 Everything that the session's programs do in their own time is waited for, with a bound.
 """
 
+import contextlib
 import json
 import os
 import pathlib
 import re
+import signal
 import subprocess
 import sys
 import threading
@@ -204,6 +206,20 @@ def anonymous_memory(process):
     except (FileNotFoundError, ProcessLookupError):
         return 0
     return sum(int(line.split()[1]) * 1024 for line in lines if line.startswith(("RssAnon:", "VmSwap:")))
+
+
+def parent_of(process):
+    return int(pathlib.Path(f"/proc/{process}/stat").read_text().rpartition(")")[2].split()[1])
+
+
+@contextlib.contextmanager
+def held(process):
+    """Does not run inside the block."""
+    os.kill(process, signal.SIGSTOP)
+    try:
+        yield
+    finally:
+        os.kill(process, signal.SIGCONT)
 
 
 def wait_until_larger(process, limit):
