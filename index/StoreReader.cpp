@@ -1,6 +1,8 @@
 #include "index/StoreReader.h"
 
+#include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <array>
@@ -35,10 +37,11 @@ std::optional<std::int64_t> numberOf(std::string_view text) {
   return number;
 }
 
-sqlite3_file* fileOf(sqlite3* connection) {
-  sqlite3_file* file = nullptr;
-  sqlite3_file_control(connection, "main", SQLITE_FCNTL_FILE_POINTER, &file);
-  return file;
+// Of how many updates that are published meanwhile an opening takes the newer store instead.
+constexpr int kMostOpenings = 10;
+
+bool areSameFile(const struct stat& left, const struct stat& right) {
+  return left.st_dev == right.st_dev && left.st_ino == right.st_ino;
 }
 
 }  // namespace
@@ -48,15 +51,11 @@ StoreReader::~StoreReader() = default;
 Result<std::unique_ptr<StoreReader>> StoreReader::open(const StoreFolder& folder, std::string_view volumeRoot,
                                                        Check check) {
   const std::string root = normalizedVolumeRoot(volumeRoot);
-  const std::string path = folder.storePath(root);
-  struct stat status {};
-  if (::lstat(path.c_str(), &status) != 0) return systemError(errno);
-  if (!S_ISREG(status.st_mode))
-    return damagedStore("no regular file");  // opening a pipe would wait for its other end
-  auto database = StoreDatabase::openImmutable(path);
-  if (!database) return database.error();
-  std::unique_ptr<StoreReader> reader(new StoreReader(std::move(database).value()));
-  if (const auto checked = reader->checkFile(check); !checked) return checked.error();
+  auto opened = openFile(folder.storePath(root));
+  if (!opened) return opened.error();
+  std::unique_ptr<StoreReader> reader(new StoreReader(std::move(opened.value().database)));
+  if (const auto checked = reader->checkFile(opened.value().file.number(), check); !checked)
+    return checked.error();
   if (reader->isOlder_) return openEmpty(root);
   for (const auto step : {&StoreReader::harden, &StoreReader::checkSchema, &StoreReader::readFacts,
                           &StoreReader::makeStatements, &StoreReader::registerFunctions}) {
@@ -69,6 +68,26 @@ Result<std::unique_ptr<StoreReader>> StoreReader::open(const StoreFolder& folder
     return Error{kStoreMissing, "another file system is mounted there than the one that was indexed"};
   }
   return reader;
+}
+
+// What is checked is read through a descriptor of its own, and is the file that SQLite has opened: the path
+// named it before and after that. Another store may take the path at any moment.
+Result<StoreReader::OpenedFile> StoreReader::openFile(const std::string& path) {
+  for (int opening = 0; opening < kMostOpenings; ++opening) {
+    struct stat status {};
+    if (::lstat(path.c_str(), &status) != 0) return systemError(errno);
+    if (!S_ISREG(status.st_mode))
+      return damagedStore("no regular file");  // opening a pipe would wait for its other end
+    FileDescriptor file(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
+    if (!file) return systemError(errno);
+    if (::fstat(file.number(), &status) != 0) return systemError(errno);
+    auto database = StoreDatabase::openImmutable(path);
+    if (!database) return database.error();
+    struct stat afterwards {};
+    if (::lstat(path.c_str(), &afterwards) != 0) return systemError(errno);
+    if (areSameFile(status, afterwards)) return OpenedFile{std::move(file), std::move(database).value()};
+  }
+  return systemError(EAGAIN);
 }
 
 // Nothing is left of the old store but that there is one.
@@ -91,19 +110,12 @@ Result<std::unique_ptr<StoreReader>> StoreReader::openEmpty(const std::string& r
   return reader;
 }
 
-// All of it through the descriptor that SQLite holds: another store may take the path at any moment.
-Result<void> StoreReader::checkFile(Check check) {
-  sqlite3_file* file = fileOf(database_.handle());
-  sqlite3_int64 size = 0;
-  if (file == nullptr || file->pMethods == nullptr || file->pMethods->xFileSize(file, &size) != SQLITE_OK) {
-    return damagedStore("its file cannot be read");
-  }
-  const auto read = [file](std::span<std::byte> bytes, std::uint64_t offset) {
-    return file->pMethods->xRead(file, bytes.data(), static_cast<int>(bytes.size()),
-                                 static_cast<sqlite3_int64>(offset)) == SQLITE_OK;
-  };
+Result<void> StoreReader::checkFile(int file, Check check) {
+  struct stat status {};
+  if (::fstat(file, &status) != 0) return systemError(errno);
   std::array<unsigned char, kHeaderBytes> header{};
-  if (!read(std::as_writable_bytes(std::span(header)), 0)) return damagedStore("it ends too early");
+  if (::pread(file, header.data(), header.size(), 0) != static_cast<ssize_t>(header.size()))
+    return damagedStore("it ends too early");
   if (std::memcmp(header.data(), kHeaderMagic.data(), kHeaderMagic.size()) != 0)
     return damagedStore("it is no store");
   const std::span<const unsigned char, 4> versionBytes = std::span(header).subspan<kUserVersionOffset, 4>();
@@ -114,9 +126,9 @@ Result<void> StoreReader::checkFile(Check check) {
                  "a later version of this program wrote the store; `norvexctl index update` makes it anew"};
   }
   isOlder_ = version < kStoreSchemaVersion;
-  mostWork_ = kWorkUnits + size / kBytesPerWorkUnit;
+  mostWork_ = kWorkUnits + status.st_size / kBytesPerWorkUnit;
   if (isOlder_ || check == Check::factsOnly) return {};
-  return checkStoreSeal(static_cast<std::uint64_t>(size), read);
+  return checkStoreSeal(file);
 }
 
 Result<void> StoreReader::harden() {

@@ -18,6 +18,7 @@
 #include "index/StoreDatabase.h"
 #include "index/StoreFolder.h"
 #include "index/StoreSchema.h"
+#include "platform/FileDescriptor.h"
 #include "platform/MetadataIndex.h"
 #include "platform/Result.h"
 
@@ -103,7 +104,12 @@ class StoreReader {
 
   static Result<std::unique_ptr<StoreReader>> openEmpty(const std::string& root);
   Result<void> harden();
-  Result<void> checkFile(Check check);
+  struct OpenedFile {
+    FileDescriptor file;  // the same file as SQLite's
+    StoreDatabase database;
+  };
+  static Result<OpenedFile> openFile(const std::string& path);
+  Result<void> checkFile(int file, Check check);
   Result<void> checkSchema();
   Result<void> readFacts();
   Result<void> makeStatements();

@@ -5,9 +5,14 @@
 
 #include <algorithm>
 #include <array>
+#include <atomic>
 #include <bit>
 #include <cerrno>
+#include <cstdint>
 #include <cstring>
+#include <span>
+#include <system_error>
+#include <thread>
 #include <vector>
 
 #include "index/StoreDatabase.h"
@@ -15,7 +20,7 @@
 namespace norvex {
 namespace {
 
-constexpr std::uint64_t kMagic = 0x314C414553585653;  // "SVXSEAL1"
+constexpr std::uint64_t kMagic = 0x324C414553585653;  // "SVXSEAL2"
 constexpr std::size_t kReadBytes = std::size_t{256}
                                    << 10U;  // stays in the second-level cache between read and sum
 
@@ -63,19 +68,6 @@ Error damaged() {
   return damagedStore("its bytes have changed");
 }
 
-Result<std::uint64_t> checksumOf(std::uint64_t length, const StoreByteReader& read) {
-  std::vector<std::byte> buffer(kReadBytes);
-  Checksum checksum;
-  for (std::uint64_t offset = 0; offset < length;) {
-    const std::size_t size = static_cast<std::size_t>(std::min<std::uint64_t>(kReadBytes, length - offset));
-    const std::span<std::byte> piece(buffer.data(), size);
-    if (!read(piece, offset)) return damaged();
-    checksum.add(piece);
-    offset += size;
-  }
-  return checksum.value();
-}
-
 bool readFully(int fd, std::span<std::byte> bytes, std::uint64_t offset) {
   while (!bytes.empty()) {
     const ssize_t count = ::pread(fd, bytes.data(), bytes.size(), static_cast<off_t>(offset));
@@ -87,6 +79,61 @@ bool readFully(int fd, std::span<std::byte> bytes, std::uint64_t offset) {
   return true;
 }
 
+// The checksum of a file: that of the checksums of its pieces, which are read on all processors at once.
+class FileChecksum {
+ public:
+  FileChecksum(int fd, std::uint64_t length)
+      : fd_(fd),
+        length_(length),
+        pieces_(static_cast<std::size_t>((length + kPieceBytes - 1) / kPieceBytes)) {}
+
+  Result<std::uint64_t> value() {
+    std::vector<std::thread> helpers;
+    const std::size_t threads = std::min<std::size_t>(std::thread::hardware_concurrency(), pieces_.size());
+    try {
+      while (helpers.size() + 1 < threads) helpers.emplace_back([this] { sumPieces(); });
+    } catch (const std::system_error&) {
+      // No more threads to be had: those that there are do it.
+    }
+    sumPieces();
+    for (std::thread& helper : helpers) helper.join();
+    if (hasFailed_) return damaged();
+    Checksum whole;
+    whole.add(std::as_bytes(std::span(pieces_)));
+    return whole.value();
+  }
+
+ private:
+  static constexpr std::uint64_t kPieceBytes = std::uint64_t{2} << 20U;
+
+  void sumPieces() {
+    std::vector<std::byte> buffer(kReadBytes);
+    for (std::size_t piece = next_++; piece < pieces_.size() && !hasFailed_; piece = next_++) {
+      if (!sumPiece(piece, buffer)) hasFailed_ = true;
+    }
+  }
+
+  bool sumPiece(std::size_t piece, std::span<std::byte> buffer) {
+    Checksum checksum;
+    const std::uint64_t begin = piece * kPieceBytes;
+    const std::uint64_t end = std::min(begin + kPieceBytes, length_);
+    for (std::uint64_t offset = begin; offset < end;) {
+      const std::span<std::byte> part = buffer.first(std::min<std::uint64_t>(buffer.size(), end - offset));
+      if (!readFully(fd_, part, offset)) return false;
+      checksum.add(part);
+      offset += part.size();
+    }
+    pieces_[piece] = checksum.value();
+    return true;
+  }
+
+  const int fd_;
+  const std::uint64_t length_;
+  std::vector<std::uint64_t> pieces_;
+  std::atomic<std::size_t> next_{0};
+  std::atomic<bool> hasFailed_{false};
+};
+
 }  // namespace
 
 Result<void> sealStore(int fd) {
@@ -94,10 +141,7 @@ Result<void> sealStore(int fd) {
   if (::fstat(fd, &status) != 0) return systemError(errno);
   Seal seal;
   seal.length = static_cast<std::uint64_t>(status.st_size);
-  const auto read = [fd](std::span<std::byte> bytes, std::uint64_t offset) {
-    return readFully(fd, bytes, offset);
-  };
-  const Result<std::uint64_t> checksum = checksumOf(seal.length, read);
+  const Result<std::uint64_t> checksum = FileChecksum(fd, seal.length).value();
   if (!checksum) return checksum.error();
   seal.checksum = checksum.value();
   const ssize_t written = ::pwrite(fd, &seal, sizeof seal, status.st_size);
@@ -106,13 +150,16 @@ Result<void> sealStore(int fd) {
   return {};
 }
 
-Result<void> checkStoreSeal(std::uint64_t fileSize, const StoreByteReader& read) {
-  if (fileSize < kStoreSealBytes) return damaged();
+Result<void> checkStoreSeal(int fd) {
+  struct stat status {};
+  if (::fstat(fd, &status) != 0) return systemError(errno);
+  const auto size = static_cast<std::uint64_t>(status.st_size);
+  if (size < kStoreSealBytes) return damaged();
   Seal seal;
-  const std::uint64_t length = fileSize - kStoreSealBytes;
-  if (!read(std::as_writable_bytes(std::span(&seal, 1)), length)) return damaged();
+  const std::uint64_t length = size - kStoreSealBytes;
+  if (!readFully(fd, std::as_writable_bytes(std::span(&seal, 1)), length)) return damaged();
   if (seal.magic != kMagic || seal.length != length) return damaged();
-  const Result<std::uint64_t> checksum = checksumOf(length, read);
+  const Result<std::uint64_t> checksum = FileChecksum(fd, length).value();
   if (!checksum) return checksum.error();
   if (checksum.value() != seal.checksum) return damaged();
   return {};

@@ -6,9 +6,6 @@
 #pragma once
 
 #include <cstddef>
-#include <cstdint>
-#include <functional>
-#include <span>
 
 #include "platform/Result.h"
 
@@ -16,14 +13,10 @@ namespace norvex {
 
 inline constexpr std::size_t kStoreSealBytes = 24;
 
-// Reads `bytes.size()` bytes at `offset`; false when they cannot be read.
-using StoreByteReader = std::function<bool(std::span<std::byte> bytes, std::uint64_t offset)>;
-
 // Appends the seal to an open, complete file. Reads back all that was written.
 Result<void> sealStore(int fd);
 
-// Succeeds when the file of `fileSize` bytes ends in the seal of what stands before it; otherwise
-// kStoreDamaged.
-Result<void> checkStoreSeal(std::uint64_t fileSize, const StoreByteReader& read);
+// Succeeds when the file ends in the seal of what stands before it; otherwise kStoreDamaged.
+Result<void> checkStoreSeal(int fd);
 
 }  // namespace norvex
