@@ -16,6 +16,7 @@
 #include "platform/linux/PressureTriggers.h"
 #include "tool/AgentSwitch.h"
 #include "tool/FigureText.h"
+#include "tool/MeasuringFindings.h"
 #include "tool/SafeText.h"
 #include "tool/Volumes.h"
 
@@ -199,10 +200,14 @@ std::vector<Finding> examine(const ToolWorld& world, const DoctorPlaces& places)
                                 systemLog(places),
                                 serviceManager(world),
                                 memoryPressure(places),
+                                ownMemory(world),
                                 contentTypes(world),
                                 hardwareModel(),
                                 preferences(),
                                 installation(),
+                                homeFolder(),
+                                startupVolumeCapacity(),
+                                startupVolumeCounts(),
                                 indexFolder(world)};
   const auto volumes = chosenVolumes(world, {});
   findings.push_back(backupSettings(volumes, world));

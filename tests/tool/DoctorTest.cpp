@@ -55,6 +55,32 @@ TEST(Doctor, FindsNothingBrokenWhereOnlySubstitutesAreUsed) {
   EXPECT_NE(document["findings"][0]["remedy"], "");
 }
 
+TEST(Doctor, AsksEachRoleThatMeasuresWhatAScanAsksItFirst) {
+  MeasuredWorld machine;
+  machine.processMemoryInfo.use = MemoryUse{.internal = 5'000'000, .compressed = 2'000'000};
+  const auto findings = examine(machine.world, kNowhere);
+  for (const char* role : {"Home folder", "Capacity", "Object counts", "Own memory"})
+    EXPECT_EQ(findingOf(findings, role).state, State::works) << role;
+  EXPECT_EQ(findingOf(findings, "Own memory").text, "measured; this process takes 7 MB");
+}
+
+TEST(Doctor, SaysWhatIsLostWhereARoleThatMeasuresFails) {
+  MeasuredWorld machine;
+  machine.volumeCatalog.failingStep = InMemoryVolumeCatalog::Step::objectCounts;
+  machine.processMemoryInfo.use = Error{2, "No such file or directory"};
+  const auto findings = examine(machine.world, kNowhere);
+  EXPECT_EQ(findingOf(findings, "Object counts").state, State::fallsBack);
+  EXPECT_THAT(findingOf(findings, "Object counts").remedy, HasSubstr("norvexctl index update /"));
+  EXPECT_EQ(findingOf(findings, "Own memory").text,
+            "No such file or directory; the agent goes on however large it grows");
+}
+
+TEST(Doctor, TellsCountsOfInodesFromThoseOfAnIndex) {
+  MeasuredWorld machine;
+  machine.volumeCatalog.countsOfVolume["/"] = {.files = 1000, .folders = 0};
+  EXPECT_THAT(findingOf(examine(machine.world, kNowhere), "Object counts").text, HasSubstr("inodes"));
+}
+
 // Over a volume with a real index.
 class DoctorOfVolumes : public ::testing::Test {
  protected:
