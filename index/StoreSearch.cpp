@@ -39,7 +39,7 @@ Result<void> StoreSearch::findMore(std::vector<std::int64_t>& matches) {
     // SQLite finds them type by type.
     std::sort(matches.begin() + static_cast<std::ptrdiff_t>(before), matches.end());
     next_ = end + 1;
-    if (store_->workDone() * 4 < kWorkOfAPiece) length_ = std::min(length_ * 2, kMostItems);
+    if (store_->workDone() * 4 < kWorkOfAPiece) length_ = length_ > kMostItems / 2 ? kMostItems : length_ * 2;
     return {};
   }
   matches.resize(before);
