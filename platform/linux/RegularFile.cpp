@@ -6,33 +6,28 @@
 
 #include <cerrno>
 
-#include "platform/linux/CallablePath.h"
-
 namespace norvex {
 namespace {
 
 constexpr int kOpenFlags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
 
 // The only place that uses the path.
-FileDescriptor openForReading(const std::string& path) {
-  const CallablePath callable(path);
-  if (callable.error() != 0) return {};
+FileDescriptor openForReading(int folder, const char* path) {
   // Asked before opening, since the opening itself releases whoever waits at the other end of a FIFO.
   struct stat attributes = {};
-  if (::fstatat(callable.folder(), callable.path(), &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
+  if (::fstatat(folder, path, &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
   if (!S_ISREG(attributes.st_mode)) return {};
 
-  FileDescriptor file(::openat(callable.folder(), callable.path(), kOpenFlags | O_NOATIME));
+  FileDescriptor file(::openat(folder, path, kOpenFlags | O_NOATIME));
   // Only the owner of a file may leave its time of last access alone.
-  if (!file && errno == EPERM)
-    file = FileDescriptor(::openat(callable.folder(), callable.path(), kOpenFlags));
+  if (!file && errno == EPERM) file = FileDescriptor(::openat(folder, path, kOpenFlags));
   return file;
 }
 
 }  // namespace
 
-std::optional<RegularFile> RegularFile::open(const std::string& path) {
-  FileDescriptor file = openForReading(path);
+std::optional<RegularFile> RegularFile::openAt(int folder, const char* path) {
+  FileDescriptor file = openForReading(folder, path);
   if (!file) return std::nullopt;
   // Asked of what was opened: something else may have taken the name in between.
   struct stat attributes = {};

@@ -4,7 +4,6 @@
 #pragma once
 
 #include <optional>
-#include <string>
 #include <utility>
 
 #include "platform/FileDescriptor.h"
@@ -14,11 +13,11 @@ namespace norvex {
 
 class RegularFile final : public ByteSource {
  public:
-  // Nothing when there is no such file, when it may not be read, and when it is anything but a regular file:
-  // links are not followed, and opening a FIFO or a device would already be noticed at its other end. Never
-  // waits for anything but the disk. The file's time of last access stays as it was where the kernel allows
-  // that, which is for the user's own files.
-  static std::optional<RegularFile> open(const std::string& path);
+  // `folder` and `path` as openat(2) has them. Nothing when there is no such file, when it may not be read,
+  // and when it is anything but a regular file: links are not followed, and opening a FIFO or a device would
+  // already be noticed at its other end. Never waits for anything but the disk. The file's time of last
+  // access stays as it was where the kernel allows that, which is for the user's own files.
+  static std::optional<RegularFile> openAt(int folder, const char* path);
 
   // As of the opening.
   std::uint64_t size() const override { return size_; }

@@ -179,7 +179,30 @@ TEST_F(Mpeg4MediaReaderTest, LeavesTheTimeOfLastAccessAlone) {
   EXPECT_EQ(accessTimeOf(path), longAgo[0].tv_sec);
 }
 
-TEST_F(Mpeg4MediaReaderTest, LeavesNoFileOpen) {
+TEST_F(Mpeg4MediaReaderTest, ReadsFilesOfOneFolderAfterThoseOfAnother) {
+  std::filesystem::create_directories(folder_ / "album");
+  std::filesystem::create_directories(folder_ / "other");
+  const Bytes bought = joined({fileType(), movie({item("purd")})});
+  const std::vector<std::string> paths = {write("album/1.m4a", purchased), write("other/1.m4a", bought),
+                                          write("1.m4a", bought), write("album/2.m4a", bought)};
+  const std::vector<std::string> all = {"one ", "purd"};
+  const std::vector<std::string> one = {"purd"};
+  EXPECT_EQ(keysOf(paths[0]), all);
+  EXPECT_EQ(keysOf(paths[3]), one);
+  EXPECT_EQ(keysOf(paths[1]), one);
+  EXPECT_EQ(keysOf(paths[2]), one);
+  EXPECT_EQ(keysOf(paths[0]), all);
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFolderThatHasTakenThePlaceOfTheOneBefore) {
+  std::filesystem::create_directories(folder_ / "album");
+  EXPECT_THAT(keysOf(write("album/1.m4a", purchased)), ElementsAre("one ", "purd"));
+  std::filesystem::rename(folder_ / "album", folder_ / "moved");
+  std::filesystem::create_directories(folder_ / "album");
+  EXPECT_THAT(keysOf(write("album/2.m4a", purchased)), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, LeavesNothingOpenButTheLastFolder) {
   const auto openFiles = [] {
     const std::filesystem::directory_iterator entries("/proc/self/fd");
     return std::distance(begin(entries), end(entries));
@@ -187,7 +210,12 @@ TEST_F(Mpeg4MediaReaderTest, LeavesNoFileOpen) {
   const std::string good = write("song.m4a", purchased);
   const std::string bad = write("text", "this is not a media file\n");
   const auto before = openFiles();
-  for (const auto& path : {good, bad, folder_ / "missing", folder_ / ""}) keysOf(path);
+  {
+    Mpeg4MediaReader reader;
+    for (const auto& path : {good, bad, folder_ / "missing", folder_ / "", std::string("/dev/zero"), good})
+      reader.itemKeys(Location::file(path));
+    EXPECT_EQ(openFiles(), before + 1);
+  }
   EXPECT_EQ(openFiles(), before);
 }
 
