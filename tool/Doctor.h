@@ -4,38 +4,14 @@
 // Called on the main thread, with the machine's roles installed.
 #pragma once
 
-#include <string>
 #include <vector>
 
-#include "platform/linux/JournalDiagnosticLog.h"
-#include "platform/linux/SyslogSystemLog.h"
-#include "tool/ToolWorld.h"
+#include "tool/Examination.h"
 
 namespace norvex {
 
-struct Finding {
-  enum class State {
-    works,
-    fallsBack,  // the agent goes on with something that is not as good
-    broken,     // the agent cannot do its work
-  };
-
-  std::string role;
-  State state = State::works;
-  std::string text;    // what was found; for people, and safe to be shown
-  std::string remedy;  // what to do; empty where there is nothing to do
-};
-
-// Where the machine keeps what is looked at.
-struct DoctorPlaces {
-  std::string journalSocket = kJournalSocket;
-  std::string systemLogSocket = kSystemLogSocket;
-  std::vector<std::string> pressureFiles;  // of memory, best first
-
-  static DoctorPlaces ofThisMachine();
-};
-
-// Every finding, in a fixed order of roles. Changes nothing.
+// Every finding, in a fixed order of roles. Leaves the machine as it was; only this very process comes last
+// at the disk from then on, as the agent does.
 std::vector<Finding> examine(const ToolWorld& world, const DoctorPlaces& places);
 
 }  // namespace norvex

@@ -9,7 +9,10 @@ namespace norvex {
 
 class InMemoryClock final : public Clock {
  public:
-  Moment now() const override { return Moment(Moment::duration(ticks_.load())); }
+  Moment now() const override { return Moment(Moment::duration(ticks_.fetch_add(driftPerReading.load()))); }
+
+  // How far each reading moves it; a clock that is out of order may go back.
+  std::atomic<Moment::duration::rep> driftPerReading{0};
 
   void advance(Moment::duration step) { ticks_ += step.count(); }
 
@@ -20,7 +23,7 @@ class InMemoryClock final : public Clock {
 
  private:
   // Not the epoch, so that a duration that is taken for a moment shows.
-  std::atomic<Moment::duration::rep> ticks_{Moment::duration(std::chrono::hours(1000)).count()};
+  mutable std::atomic<Moment::duration::rep> ticks_{Moment::duration(std::chrono::hours(1000)).count()};
 };
 
 }  // namespace norvex

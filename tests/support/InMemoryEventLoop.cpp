@@ -10,6 +10,10 @@ void InMemoryEventLoop::postAfter(Clock::Moment::duration delay, Input input) {
 
 bool InMemoryEventLoop::runOnce(Clock::Moment deadline) {
   passes.push_back({clock_.now(), deadline});
+  if (isStuck) {
+    clock_.advanceTo(deadline);
+    return false;
+  }
   if (inputs_.empty() && delayed_.empty()) throw NothingToWaitFor();
   if (inputs_.empty() && delayed_.begin()->first <= deadline) {
     clock_.advanceTo(delayed_.begin()->first);

@@ -43,6 +43,8 @@ class InMemoryEventLoop final : public EventLoop {
   // Calls `whenRun`, then returns as if there were nothing to wait on.
   void run() override;
 
+  // Inputs stay where they are, whatever runs the loop.
+  bool isStuck = false;
   // The passes that runOnce() made.
   std::vector<Pass> passes;
   std::function<void()> whenRun = [] { throw LoopIsParked(); };

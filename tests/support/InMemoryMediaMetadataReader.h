@@ -1,4 +1,4 @@
-// Media files as lists of item keys; every other path is no media file.
+// Media files as lists of item keys; every other path is no media file, unless a test says what all others are.
 #pragma once
 
 #include <map>
@@ -17,10 +17,11 @@ class InMemoryMediaMetadataReader final : public MediaMetadataReader {
   std::vector<MediaItemKey> itemKeys(const Location& file) override {
     calls_.add("itemKeys " + file.path());
     const auto found = keysOfFile.find(file.path());
-    return found == keysOfFile.end() ? std::vector<MediaItemKey>() : found->second;
+    return found == keysOfFile.end() ? keysOfOthers : found->second;
   }
 
   std::map<std::string, std::vector<MediaItemKey>> keysOfFile;
+  std::vector<MediaItemKey> keysOfOthers;
 
  private:
   CallJournal& calls_;

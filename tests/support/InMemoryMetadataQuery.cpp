@@ -51,6 +51,7 @@ bool InMemoryMetadataQuery::start() {
   record_->started = true;
   startingLoop_ = &index_.loops_.current();
   auto rest = [this, observation = observation_, record = record_, &mainLoop = index_.loops_.main()] {
+    if (record->stopped) return;  // `this` may be gone
     gather();
     mainLoop.post([this, observation, record] { notify(*observation, *this, *record); });
   };
