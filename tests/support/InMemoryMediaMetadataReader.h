@@ -1,4 +1,5 @@
-// Media files as lists of item keys; every other path is no media file, unless a test says what all others are.
+// Media files as lists of item keys; every other path is no media file, unless a test says what all others
+// are.
 #pragma once
 
 #include <map>
