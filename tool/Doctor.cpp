@@ -50,7 +50,7 @@ constexpr Look kLooks[] = {
 // The first of the variables that is set and not empty, as the C library reads them; else the plain locale.
 std::string localeOfNumbers(const Environment& environment) {
   for (const char* name : {"LC_ALL", "LC_NUMERIC", "LANG"}) {
-    const std::string value = valueOf(environment, name).value_or("");
+    std::string value = valueOf(environment, name).value_or("");
     if (!value.empty()) return value;
   }
   return "C";
