@@ -70,12 +70,15 @@ def force_reports_again_and_leaves_the_timer_on(s):
 def by_hand_it_waits_for_the_signal_to_run(s):
     lib.run("norvexctl", "index", "update")
     with subprocess.Popen([lib.AGENT]) as agent:
-        waits = pathlib.Path(f"/proc/{agent.pid}/task")
-        lib.eventually(lambda: [(thread / "wchan").read_text() for thread in waits.iterdir()].count("0") == 0
-                       and len(list(waits.iterdir())) > 1, "the agent waits in all its threads")
-        assert agent.poll() is None and s.reports() == [] and not PREFERENCES.exists()
-        agent.send_signal(signal.SIGUSR1)
-        assert agent.wait(lib.LIMIT_S) == 0
+        try:
+            waits = pathlib.Path(f"/proc/{agent.pid}/task")
+            lib.eventually(lambda: [(thread / "wchan").read_text() for thread in waits.iterdir()].count("0") == 0
+                           and len(list(waits.iterdir())) > 1, "the agent waits in all its threads")
+            assert agent.poll() is None and s.reports() == [] and not PREFERENCES.exists()
+            agent.send_signal(signal.SIGUSR1)
+            assert agent.wait(lib.LIMIT_S) == 0
+        finally:
+            agent.kill()  # one that still waits would be waited for without end
     s.journal.wait(lib.is_report, "the report", 2)
     s.assert_switched_off()
 
