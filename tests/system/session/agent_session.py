@@ -77,6 +77,7 @@ ln -s /run/session-test/every-second.conf "/etc/systemd/user/$timer.d/"
     grep '^Condition' "/usr/lib/systemd/user/$service" | grep -vE 'Pressure|ACPower'
     echo '[Service]'
     echo 'CPUSchedulingPolicy=other'
+    echo 'Nice=0'
     # The manager forgets how a process ended as soon as nobody needs its unit.
     echo 'ExecStopPost=/bin/echo ended: ${EXIT_CODE} ${EXIT_STATUS} ${SERVICE_RESULT}'
 } >"/etc/systemd/user/$service.d/test.conf"
