@@ -16,8 +16,6 @@
 namespace norvex {
 namespace {
 
-constexpr const char* forceArgument = "--force";
-
 // 1000 MiB. An agent that has grown beyond this while memory is short does more harm than its report is
 // worth.
 constexpr std::uint64_t memoryLimitBytes = 1'048'576'000;

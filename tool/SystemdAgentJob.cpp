@@ -20,6 +20,13 @@ constexpr std::string_view kDoNotTrack = "DO_NOT_TRACK=";
 
 using Moment = std::chrono::system_clock::time_point;
 
+// A bus that is not there is not to be taken for a job that is not.
+Result<UserManager> reach(const Environment& environment) {
+  auto manager = UserManager::connect(environment);
+  if (manager || manager.error().code != ENOENT) return manager;
+  return Error{ENOMEDIUM, manager.error().description};
+}
+
 std::optional<std::int64_t> secondsOf(const std::optional<Moment>& moment) {
   if (!moment) return std::nullopt;
   return std::chrono::duration_cast<std::chrono::seconds>(moment->time_since_epoch()).count();
@@ -74,25 +81,25 @@ Result<AgentJobState> stateOf(UserManager& manager) {
 }  // namespace
 
 Result<AgentJobState> SystemdAgentJob::state() {
-  auto manager = UserManager::connect(environment_);
+  auto manager = reach(environment_);
   if (!manager) return manager.error();
   return stateOf(manager.value());
 }
 
 Result<void> SystemdAgentJob::enable() {
-  auto manager = UserManager::connect(environment_);
+  auto manager = reach(environment_);
   if (!manager) return manager.error();
   return TimedJob(manager.value(), agentLabel).enable();
 }
 
 Result<void> SystemdAgentJob::disable() {
-  auto manager = UserManager::connect(environment_);
+  auto manager = reach(environment_);
   if (!manager) return manager.error();
   return TimedJob(manager.value(), agentLabel).disable();
 }
 
 Result<AgentJob::Started> SystemdAgentJob::run() {
-  auto manager = UserManager::connect(environment_);
+  auto manager = reach(environment_);
   if (!manager) return manager.error();
   const std::string service = TimedJob(manager.value(), agentLabel).service();
   const auto before = manager.value().lastRun(service);

@@ -11,6 +11,7 @@
 #include <string>
 #include <string_view>
 
+#include "agent/AgentIdentity.h"
 #include "platform/FileDescriptor.h"
 #include "platform/linux/Files.h"
 
@@ -19,6 +20,7 @@ namespace {
 
 constexpr std::string_view kAgentProgram = "NorvexAgent";
 constexpr std::size_t kLargestStatus = std::size_t{64} << 10;
+constexpr std::size_t kLargestCommandLine = std::size_t{4} << 20;
 
 // The value of a line "Name:\tvalue" of a process's status file.
 std::string_view lineOf(std::string_view status, std::string_view name) {
@@ -37,13 +39,26 @@ bool waitsForSignal(std::string_view status) {
   return (mask >> (SIGUSR1 - 1) & 1) != 0;
 }
 
+// One that has ended keeps its name and its signals until its parent asks for it.
+bool hasEnded(std::string_view status) {
+  const std::string_view state = lineOf(status, "State");
+  return state.starts_with('Z') || state.starts_with('X');
+}
+
+// Each argument of the command line ends with a null byte.
+bool isForced(const std::string& commandLine) {
+  return commandLine.find('\0' + std::string(forceArgument) + '\0') != std::string::npos;
+}
+
 bool isWaitingAgent(const std::string& process) {
   struct stat folder {};
   if (::stat(process.c_str(), &folder) != 0 || folder.st_uid != ::getuid()) return false;
   const auto text = readStartOfFile(process + "/status", kLargestStatus);
   if (!text) return false;
   const std::string status = "\n" + text.value();
-  return lineOf(status, "Name") == kAgentProgram && waitsForSignal(status);
+  if (lineOf(status, "Name") != kAgentProgram || hasEnded(status) || !waitsForSignal(status)) return false;
+  const auto commandLine = readStartOfFile(process + "/cmdline", kLargestCommandLine);
+  return commandLine && !isForced(commandLine.value());
 }
 
 // By a descriptor, which stands for this process even when its number has been given to another meanwhile.

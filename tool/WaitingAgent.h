@@ -10,7 +10,8 @@
 namespace norvex {
 
 // Sends the run signal to this user's agent that waits for it, and returns its process id. Absent when there
-// is none: a process of that name which would not outlive the signal is left alone.
+// is none. A process of that name which would not outlive the signal is left alone, and so is an agent that
+// runs by force.
 std::optional<pid_t> wakeWaitingAgent();
 
 }  // namespace norvex

@@ -174,7 +174,7 @@ for timer in @TIMER@ @NEXT_TIMER@; do
 done
 # How busy this machine is, and how it gets its power, decides nothing here.
 mkdir -p /run/systemd/user/com.brixo.NorvexAgent.service.d
-printf '[Unit]\nConditionACPower=\n[Service]\nCPUSchedulingPolicy=other\n' \
+printf '[Unit]\nConditionACPower=\n[Service]\nCPUSchedulingPolicy=other\nNice=0\n' \
     >/run/systemd/user/com.brixo.NorvexAgent.service.d/always.conf
 cp @FILES@ /run/session-test
 """

@@ -13,11 +13,13 @@ import unittest
 PROGRAM = pathlib.Path(sys.argv[1])
 FOLDER = pathlib.Path(sys.argv[2])
 MANUAL = pathlib.Path(sys.argv[3])
+LIMIT_S = 60
 
 
 def words_of(command):
     """What the help of a command says may follow it: the commands and the options."""
-    text = subprocess.run([PROGRAM, *command, "--help"], check=True, capture_output=True, text=True).stdout
+    text = subprocess.run([PROGRAM, *command, "--help"], check=True, capture_output=True, text=True,
+                          timeout=LIMIT_S).stdout
     sections = dict(re.findall(r"^([A-Z][a-z]+):\n((?:  .*\n?)+)", text, re.M))
     commands = re.findall(r"^  (\w+)", sections.get("Subcommands", ""), re.M)
     options = [name for left in re.findall(r"^  (-[-\w,]+)", sections["Options"], re.M) for name in left.split(",")]
@@ -43,7 +45,7 @@ def fish_offers(command, start):
 
 
 def output(*command):
-    return subprocess.run(command, check=True, capture_output=True, text=True, timeout=60).stdout.splitlines()
+    return subprocess.run(command, check=True, capture_output=True, text=True, timeout=LIMIT_S).stdout.splitlines()
 
 
 class Completions(unittest.TestCase):

@@ -3,15 +3,14 @@
 #include <gtest/gtest.h>
 #include <sys/file.h>
 #include <sys/syscall.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <csignal>
-#include <fstream>
 #include <string>
 #include <thread>
 
 #include "AgentWorld.h"
+#include "ProcessStatus.h"
 #include "platform/FileDescriptor.h"
 #include "platform/linux/IoPriority.h"
 
@@ -37,25 +36,10 @@ class HeldMessages {
   FileDescriptor file_;
 };
 
-// The signals that the process ignores: of a line of its status file.
-std::uint64_t ignoredSignals(pid_t process) {
-  std::ifstream status("/proc/" + std::to_string(process) + "/status");
-  for (std::string line; std::getline(status, line);) {
-    if (line.starts_with("SigIgn:")) return std::stoull(line.substr(line.find('\t')), nullptr, 16);
-  }
-  return 0;
-}
-
-bool ignores(pid_t process, int signal) {
-  return (ignoredSignals(process) >> (signal - 1) & 1) != 0;
-}
-
 // False when the process has ended before it came to it.
 bool waitUntilItReports(pid_t process) {
-  while (!ignores(process, SIGTERM)) {
-    siginfo_t end{};
-    if (::waitid(P_PID, static_cast<id_t>(process), &end, WEXITED | WNOHANG | WNOWAIT) != 0) return false;
-    if (end.si_pid != 0) return false;
+  while (!hasSignal(process, "SigIgn", SIGTERM)) {
+    if (hasEnded(process)) return false;
     std::this_thread::yield();
   }
   return true;
@@ -67,7 +51,7 @@ TEST(ReportingProcess, IsNotEndedBetweenTheFirstMessageAndTheRecordOfTheRelease)
   const pid_t process = world.start({"--force"});
   ASSERT_TRUE(waitUntilItReports(process));
   for (const int signal : kEndingSignals) {
-    EXPECT_TRUE(ignores(process, signal)) << signal;
+    EXPECT_TRUE(hasSignal(process, "SigIgn", signal)) << signal;
     EXPECT_EQ(::kill(process, signal), 0);
   }
   messages.release();

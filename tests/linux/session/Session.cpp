@@ -18,7 +18,7 @@
 namespace norvex {
 namespace {
 
-constexpr std::chrono::seconds kPatience{10};
+constexpr std::chrono::seconds kPatience{60};
 constexpr int kStepMilliseconds = 20;
 
 std::string home() {
@@ -89,7 +89,8 @@ void logOutAndIn() {
   if (!shell("systemctl --user exit")) giveUp("no log-out");
   const auto isNew = [&] {
     const pid_t now = processOf(kManagerCommand);
-    return now != 0 && now != before && shell("systemctl --user is-system-running --wait >/dev/null 2>&1");
+    return now != 0 && now != before &&
+           shell("timeout 60 systemctl --user is-system-running --wait >/dev/null 2>&1");
   };
   if (!eventually(isNew)) giveUp("no new session: " + outputOf("systemctl --user --failed"));
 }

@@ -20,7 +20,7 @@ bool shell(const std::string& command);
 // What a shell command prints on its standard output.
 std::string outputOf(const std::string& command);
 
-// Asks again and again until it is so; false when it is not so after ten seconds. For what the session's own
+// Asks again and again until it is so; false when it is not so after a minute. For what the session's own
 // programs do in their own time.
 bool eventually(const std::function<bool()>& isSo);
 

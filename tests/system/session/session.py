@@ -51,7 +51,7 @@ class Journal:
 
     def __init__(self):
         # Without an entry of his own a user has no journal that could be followed.
-        subprocess.run(["systemd-cat", "-t", "session-test", "echo", "begins"], check=True)
+        run("systemd-cat", "-t", "session-test", "echo", "begins")
         eventually(lambda: run("journalctl", "-q", "-t", "session-test", check=False), "a first entry")
         self._entries = []
         self._news = threading.Condition()
@@ -125,8 +125,9 @@ class Session:
 
         def is_there():
             main = int(systemctl("show", "-P", "MainPID", SERVICE))
-            if main and os.path.basename(os.readlink(f"/proc/{main}/exe")) == "NorvexAgent":
-                found.append(main)
+            with contextlib.suppress(OSError):  # it is not there yet, or no longer
+                if main and os.path.basename(os.readlink(f"/proc/{main}/exe")) == "NorvexAgent":
+                    found.append(main)
             return bool(found)
 
         eventually(is_there, "the agent is running")
@@ -143,15 +144,15 @@ class Session:
     def last_version_run(self):
         return json.loads(PREFERENCES.read_text())["LastVersionRun"] if PREFERENCES.exists() else None
 
-    def agent_lines(self):
-        """What the agent told the system log."""
-        return [entry["MESSAGE"] for entry in self.journal.matching(
-            lambda entry: entry.get("SYSLOG_IDENTIFIER") == "NorvexAgent" and not is_report(entry))]
+    def wait_for_agent_line(self, test, count=1):
+        """What the agent tells the system log comes another way than what the manager tells, and may come after it."""
+        self.journal.wait(lambda entry: entry.get("SYSLOG_IDENTIFIER") == "NorvexAgent" and not is_report(entry)
+                          and test(entry["MESSAGE"]), "what the agent says", count)
 
     def exit_of_agent(self):
         """How its last process ended, with which status, and what the service manager makes of it."""
-        lines = [entry["MESSAGE"] for entry in self.journal.wait(says("ended: "), "how the agent ended")]
-        return lines[-1].removeprefix("ended: ")
+        self.journal.wait(says("ended: "), "how the agent ended")
+        return self.journal.matching(says("ended: "))[-1]["MESSAGE"].removeprefix("ended: ")
 
     def timer_state(self):
         """(whether it will be started at a login, whether it is waiting now)"""
@@ -214,12 +215,13 @@ def parent_of(process):
 
 @contextlib.contextmanager
 def held(process):
-    """Does not run inside the block."""
+    """Does not run inside the block, unless the service manager ends it there: that lets it go on to its end."""
     os.kill(process, signal.SIGSTOP)
     try:
         yield
     finally:
-        os.kill(process, signal.SIGCONT)
+        with contextlib.suppress(ProcessLookupError):
+            os.kill(process, signal.SIGCONT)
 
 
 def wait_until_larger(process, limit):
