@@ -13,8 +13,24 @@ function(norvex_target_settings target)
   target_compile_options(${target} PRIVATE ${NORVEX_COMPILE_OPTIONS})
   if(NORVEX_SANITIZE)
     target_link_options(${target} PRIVATE -fsanitize=${NORVEX_SANITIZE})
+    if(NOT ${target} STREQUAL norvex_precompiled)
+      target_precompile_headers(${target} REUSE_FROM norvex_precompiled)
+    endif()
   endif()
 endfunction()
+
+# The builds for the sanitizers read the headers that most sources include once, and not once a source. All other builds
+# go without, so that a source that lacks an include of its own fails there.
+if(NORVEX_SANITIZE)
+  find_package(GTest REQUIRED)
+  file(CONFIGURE OUTPUT ${CMAKE_BINARY_DIR}/precompiled.cpp CONTENT "// Only the headers count.\n")
+  add_library(norvex_precompiled OBJECT ${CMAKE_BINARY_DIR}/precompiled.cpp)
+  norvex_target_settings(norvex_precompiled)
+  target_link_libraries(norvex_precompiled PRIVATE GTest::gmock)
+  target_precompile_headers(norvex_precompiled PRIVATE
+    <algorithm> <array> <charconv> <chrono> <filesystem> <fstream> <functional> <map> <memory> <mutex> <optional> <sstream>
+    <string> <string_view> <thread> <unordered_map> <variant> <vector> <gmock/gmock.h> <gtest/gtest.h>)
+endif()
 
 # norvex_room(NAME SOURCES a.cpp ... ROOMS platform ... LIBRARIES PkgConfig::X ...)
 #
