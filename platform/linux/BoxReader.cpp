@@ -38,16 +38,6 @@ std::optional<Box> BoxReader::boxAt(std::uint64_t offset, const Box& parent) {
   return Box{bigEndian32(header->data() + kSizeLength), offset + headerLength, offset + size};
 }
 
-std::optional<std::string_view> BoxReader::bytesAt(std::uint64_t offset, std::size_t length) {
-  const auto isInWindow = [&] {
-    return offset >= windowBegin_ && offset - windowBegin_ <= windowLength_ &&
-           length <= windowLength_ - static_cast<std::size_t>(offset - windowBegin_);
-  };
-  if (!isInWindow() && !(moveWindowTo(offset) && isInWindow())) return std::nullopt;
-  return std::string_view(window_.data(), windowLength_)
-      .substr(static_cast<std::size_t>(offset - windowBegin_), length);
-}
-
 bool BoxReader::moveWindowTo(std::uint64_t offset) {
   if (offset >= source_.size()) return false;
   const auto wanted = static_cast<std::size_t>(std::min<std::uint64_t>(windowSize, source_.size() - offset));

@@ -51,9 +51,17 @@ class BoxReader {
 
   // The `length` bytes at `offset`, at most windowSize of them, valid until the next call; or nothing when
   // not all of them can be read.
-  std::optional<std::string_view> bytesAt(std::uint64_t offset, std::size_t length);
+  std::optional<std::string_view> bytesAt(std::uint64_t offset, std::size_t length) {
+    if (!isInWindow(offset, length) && !(moveWindowTo(offset) && isInWindow(offset, length)))
+      return std::nullopt;
+    return std::string_view(window_.data() + (offset - windowBegin_), length);
+  }
 
  private:
+  bool isInWindow(std::uint64_t offset, std::size_t length) const {
+    return offset >= windowBegin_ && offset - windowBegin_ <= windowLength_ &&
+           length <= windowLength_ - static_cast<std::size_t>(offset - windowBegin_);
+  }
   bool moveWindowTo(std::uint64_t offset);
 
   ByteSource& source_;

@@ -27,8 +27,8 @@ constexpr std::uint32_t kFreeFormName = boxType("name");
 // One byte of version and three of flags, with which some boxes begin.
 constexpr std::uint64_t kVersionLength = 4;
 
-// Most lists are shorter: their keys take one allocation.
-constexpr std::size_t kUsualItems = 32;
+// Most lists are shorter: their keys take one allocation, and one of a size that the C library has at hand.
+constexpr std::size_t kUsualItems = 24;
 
 class Walk {
  public:
