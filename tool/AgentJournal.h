@@ -11,7 +11,7 @@
 
 namespace norvex {
 
-struct JournalEntry {
+struct AgentJournalEntry {
   std::int64_t time = 0;      // microseconds since 1970
   int priority = 0;           // as of syslog; 3 is an error
   std::string text;           // any bytes; of a diagnostic message its JSON
@@ -24,7 +24,7 @@ class AgentJournal {
 
   // The entries of this user's agent from this moment on (seconds since 1970), oldest first. None is no
   // failure, nor is a machine that keeps no journal. Fails when there is a journal and it cannot be read.
-  virtual Result<std::vector<JournalEntry>> entriesSince(std::int64_t moment) = 0;
+  virtual Result<std::vector<AgentJournalEntry>> entriesSince(std::int64_t moment) = 0;
 };
 
 }  // namespace norvex

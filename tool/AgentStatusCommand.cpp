@@ -30,7 +30,7 @@ struct AgentStatus {
   std::size_t messages = 0;                // of that report
   std::optional<AgentJobState> job;
   AgentSwitch agentSwitch;
-  std::vector<JournalEntry> errors;  // the agent's own, since the last run
+  std::vector<AgentJournalEntry> errors;  // the agent's own, since the last run
   std::vector<NotReadyVolume> notReady;
 };
 
@@ -76,7 +76,7 @@ class AgentStatusCommand {
     const auto since = status_.job ? status_.job->lastStart.value_or(recent) : recent;
     const auto entries = world_.agentJournal.entriesSince(since);
     if (!entries) return;  // told when the reports were read
-    for (const JournalEntry& entry : entries.value()) {
+    for (const AgentJournalEntry& entry : entries.value()) {
       if (!entry.isDiagnostic && entry.priority <= kErrorPriority) status_.errors.push_back(entry);
     }
     if (status_.errors.size() > kMostLines)
@@ -134,7 +134,7 @@ class AgentStatusCommand {
                         << world_.out.inked(Console::Ink::bold, "Why nothing has been reported") << '\n';
     for (const NotReadyVolume& volume : status_.notReady)
       writeLine("Volume", safeText(volume.root) + ": " + volume.fault.message);
-    for (const JournalEntry& entry : status_.errors)
+    for (const AgentJournalEntry& entry : status_.errors)
       writeLine("Log", localTime(entry.time / kMicroseconds) + " " + safeText(entry.text));
   }
 
@@ -166,7 +166,7 @@ class AgentStatusCommand {
       document["notReady"].push_back(std::move(entry));
     }
     document["log"] = JsonDocument::array();
-    for (const JournalEntry& entry : status_.errors) {
+    for (const AgentJournalEntry& entry : status_.errors) {
       JsonDocument line{{"time", utcTime(entry.time / kMicroseconds)}};
       setText(line, "message", entry.text);
       document["log"].push_back(std::move(line));

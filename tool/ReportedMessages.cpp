@@ -33,7 +33,7 @@ class Reader {
   void readJournal(AgentJournal& journal) {
     const auto entries = journal.entriesSince(since_);
     if (!entries) return faults_.add("journal", "unreadable", entries.error().description);
-    for (const JournalEntry& entry : entries.value()) {
+    for (const AgentJournalEntry& entry : entries.value()) {
       if (!entry.isDiagnostic) continue;
       auto message = parsedMessage(entry.text);
       if (!message) {

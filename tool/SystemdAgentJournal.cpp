@@ -52,8 +52,8 @@ std::optional<std::string> field(sd_journal* journal, std::string_view name) {
   return std::string(text);
 }
 
-JournalEntry presentEntry(sd_journal* journal) {
-  JournalEntry entry;
+AgentJournalEntry presentEntry(sd_journal* journal) {
+  AgentJournalEntry entry;
   std::uint64_t time = 0;
   if (::sd_journal_get_realtime_usec(journal, &time) >= 0) entry.time = static_cast<std::int64_t>(time);
   const std::string priority = field(journal, "PRIORITY").value_or("");
@@ -65,16 +65,16 @@ JournalEntry presentEntry(sd_journal* journal) {
 
 }  // namespace
 
-Result<std::vector<JournalEntry>> SystemdAgentJournal::entriesSince(std::int64_t moment) {
+Result<std::vector<AgentJournalEntry>> SystemdAgentJournal::entriesSince(std::int64_t moment) {
   auto opened = openJournal();
   if (!opened) return opened.error();
   sd_journal* journal = opened.value().get();
-  std::vector<JournalEntry> entries;
+  std::vector<AgentJournalEntry> entries;
   // From the newest backwards, so that what is asked for is there however much came before.
   ::sd_journal_seek_tail(journal);
   int status = 0;
   while (entries.size() < kMostEntries && (status = ::sd_journal_previous(journal)) > 0) {
-    JournalEntry entry = presentEntry(journal);
+    AgentJournalEntry entry = presentEntry(journal);
     if (entry.time < moment * kMicroseconds) break;
     entries.push_back(std::move(entry));
   }

@@ -9,7 +9,7 @@ class SystemdAgentJournal final : public AgentJournal {
  public:
   // What other users' agents, or programs that only say that they are the agent, have written under another
   // user's id is not seen. At most the newest 100,000 entries are looked at.
-  Result<std::vector<JournalEntry>> entriesSince(std::int64_t moment) override;
+  Result<std::vector<AgentJournalEntry>> entriesSince(std::int64_t moment) override;
 };
 
 }  // namespace norvex

@@ -63,7 +63,7 @@ TEST(AgentStatusOf, AReleaseThatHasNotReportedShowsTheLinesOfTheLastRunAlone) {
   machine.job.content.lastResult = "success";
   machine.job.content.nextRun = MeasuredWorld::kNow + 600;
   const auto line = [](std::int64_t age, int priority, const char* text) {
-    return JournalEntry{
+    return AgentJournalEntry{
         .time = (MeasuredWorld::kNow - age) * kMicroseconds, .priority = priority, .text = text};
   };
   machine.journal.entries = {line(90, 3, "of an earlier run"), line(30, 3, "Failed to get it"),

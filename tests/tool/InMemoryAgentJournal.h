@@ -11,16 +11,16 @@ namespace norvex {
 
 class InMemoryAgentJournal final : public AgentJournal {
  public:
-  Result<std::vector<JournalEntry>> entriesSince(std::int64_t moment) override {
+  Result<std::vector<AgentJournalEntry>> entriesSince(std::int64_t moment) override {
     if (failure) return *failure;
-    std::vector<JournalEntry> some;
-    for (const JournalEntry& entry : entries) {
+    std::vector<AgentJournalEntry> some;
+    for (const AgentJournalEntry& entry : entries) {
       if (entry.time >= moment * 1'000'000) some.push_back(entry);
     }
     return some;
   }
 
-  std::vector<JournalEntry> entries;
+  std::vector<AgentJournalEntry> entries;
   std::optional<Error> failure;
 };
 

@@ -20,7 +20,7 @@ constexpr std::int64_t kMicroseconds = 1'000'000;
 // 2023-11-14 22:00:00, :05 and :10 UTC.
 constexpr std::int64_t kFirst = 1'699'999'200, kSecond = kFirst + 300, kThird = kFirst + 600;
 
-JournalEntry messageEntry(std::int64_t time, const std::string& text) {
+AgentJournalEntry messageEntry(std::int64_t time, const std::string& text) {
   return {.time = time * kMicroseconds, .priority = 5, .text = text, .isDiagnostic = true};
 }
 

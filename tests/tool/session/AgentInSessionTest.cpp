@@ -71,10 +71,10 @@ TEST(SystemdAgentJournal, ReadsWhatTheAgentHasReported) {
 TEST(SystemdAgentJournal, TellsTheAgentsOwnLinesFromItsMessages) {
   SyslogSystemLog().syslog(LogLevel::error, "Failed to get it");
   SystemdAgentJournal journal;
-  std::vector<JournalEntry> lines;
+  std::vector<AgentJournalEntry> lines;
   ASSERT_TRUE(eventually([&] {
     lines = journal.entriesSince(0).value();
-    std::erase_if(lines, [](const JournalEntry& entry) { return entry.text != "Failed to get it"; });
+    std::erase_if(lines, [](const AgentJournalEntry& entry) { return entry.text != "Failed to get it"; });
     return !lines.empty();
   }));
   EXPECT_EQ(lines.front().priority, 3);
