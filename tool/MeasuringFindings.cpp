@@ -17,11 +17,12 @@ constexpr const char* kStartupVolume = "/";
 Finding homeFolder(const Examined&) {
   const std::string role = "Home folder";
   const std::string& home = platform().userFolders.home();
-  const std::string remedy = "set HOME to your home folder";
   if (!platform().fileExistence.exists(home))
-    return {role, State::broken, safeText(home) + " is not there; nothing in it is measured", remedy};
+    return {role, State::broken, safeText(home) + " is not there; nothing in it is measured",
+            "set HOME to your home folder"};
   if (!platform().directoryListing.names(home))
-    return {role, State::broken, safeText(home) + " cannot be read; nothing in it is measured", remedy};
+    return {role, State::broken, safeText(home) + " cannot be read; nothing in it is measured",
+            "make the folder readable for you"};
   return {role, State::works, safeText(home), ""};
 }
 

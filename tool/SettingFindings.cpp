@@ -4,10 +4,12 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <clocale>
 #include <cstdint>
 #include <optional>
+#include <string>
 
 #include "index/ContentTypes.h"
 #include "platform/Platform.h"

@@ -1,15 +1,10 @@
 // Reads the keys of the metadata items of MPEG-4 files: of their box headers, a few KiB a file.
 //
-// Between calls it keeps the folder of the last file open: the next one mostly lies beside it, as the songs
-// of an album do, and is then found by its name alone. Called by one thread at a time.
+// Between calls it keeps the folder of the last file open. Called by one thread at a time.
 #pragma once
 
-#include <optional>
-#include <string>
-
-#include "platform/FileDescriptor.h"
 #include "platform/MediaMetadataReader.h"
-#include "platform/linux/RegularFile.h"
+#include "platform/linux/MediaFolder.h"
 
 namespace norvex {
 
@@ -20,10 +15,7 @@ class Mpeg4MediaReader final : public MediaMetadataReader {
   std::vector<MediaItemKey> itemKeys(const Location& file) override;
 
  private:
-  std::optional<RegularFile> open(const std::string& path);
-
-  std::string folderPath_;  // with its last separator
-  FileDescriptor folder_;
+  MediaFolder folder_;
 };
 
 }  // namespace norvex

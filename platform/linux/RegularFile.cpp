@@ -11,23 +11,23 @@ namespace {
 
 constexpr int kOpenFlags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
 
-// The only place that uses the path.
-FileDescriptor openForReading(int folder, const char* path) {
-  // Asked before opening, since the opening itself releases whoever waits at the other end of a FIFO.
+bool isRegularFile(int folder, const char* path) {
   struct stat attributes = {};
-  if (::fstatat(folder, path, &attributes, AT_SYMLINK_NOFOLLOW) != 0) return {};
-  if (!S_ISREG(attributes.st_mode)) return {};
-
-  FileDescriptor file(::openat(folder, path, kOpenFlags | O_NOATIME));
-  // Only the owner of a file may leave its time of last access alone.
-  if (!file && errno == EPERM) file = FileDescriptor(::openat(folder, path, kOpenFlags));
-  return file;
+  return ::fstatat(folder, path, &attributes, AT_SYMLINK_NOFOLLOW) == 0 && S_ISREG(attributes.st_mode);
 }
 
 }  // namespace
 
 std::optional<RegularFile> RegularFile::openAt(int folder, const char* path) {
-  FileDescriptor file = openForReading(folder, path);
+  // Asked before opening, since the opening itself releases whoever waits at the other end of a FIFO.
+  if (!isRegularFile(folder, path)) return std::nullopt;
+  return openKnownAt(folder, path);
+}
+
+std::optional<RegularFile> RegularFile::openKnownAt(int folder, const char* path) {
+  FileDescriptor file(::openat(folder, path, kOpenFlags | O_NOATIME));
+  // Only the owner of a file may leave its time of last access alone.
+  if (!file && errno == EPERM) file = FileDescriptor(::openat(folder, path, kOpenFlags));
   if (!file) return std::nullopt;
   // Asked of what was opened: something else may have taken the name in between.
   struct stat attributes = {};

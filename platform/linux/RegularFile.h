@@ -19,6 +19,10 @@ class RegularFile final : public ByteSource {
   // access stays as it was where the kernel allows that, which is for the user's own files.
   static std::optional<RegularFile> openAt(int folder, const char* path);
 
+  // The same of what has just been seen to be a regular file: it is opened without a further look. Should
+  // something else have taken its place since, it is closed unread.
+  static std::optional<RegularFile> openKnownAt(int folder, const char* path);
+
   // As of the opening.
   std::uint64_t size() const override { return size_; }
   std::size_t read(std::uint64_t offset, std::span<char> buffer) override;

@@ -137,16 +137,58 @@ TEST_F(Mpeg4MediaReaderTest, ReadsThroughALinkToAFolderOnTheWay) {
   EXPECT_THAT(keysOf(folder_ / "here/song.m4a"), ElementsAre("one ", "purd"));
 }
 
+// Knows whether somebody has opened a file since.
+class OpeningWatch {
+ public:
+  explicit OpeningWatch(const std::string& path) : watch_(::inotify_init1(IN_NONBLOCK | IN_CLOEXEC)) {
+    EXPECT_GE(::inotify_add_watch(watch_.number(), path.c_str(), IN_OPEN), 0);
+  }
+  bool hasSeenOne() const {
+    std::array<char, 4096> events{};
+    return ::read(watch_.number(), events.data(), events.size()) > 0;
+  }
+
+ private:
+  FileDescriptor watch_;
+};
+
 TEST_F(Mpeg4MediaReaderTest, LeavesAFifoUnopened) {
   const std::string path = folder_ / "fifo.m4a";
   ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
-  const FileDescriptor watch(::inotify_init1(IN_NONBLOCK | IN_CLOEXEC));
-  ASSERT_GE(::inotify_add_watch(watch.number(), path.c_str(), IN_OPEN), 0);
-
+  const OpeningWatch watch(path);
   EXPECT_THAT(keysOf(path), IsEmpty());
+  EXPECT_FALSE(watch.hasSeenOne());
+}
 
-  std::array<char, 4096> events{};
-  EXPECT_EQ(::read(watch.number(), events.data(), events.size()), -1) << "somebody opened the FIFO";
+TEST_F(Mpeg4MediaReaderTest, LeavesAFifoUnopenedThatHasTakenThePlaceOfAFileThatWasRead) {
+  const std::string path = write("song.m4a", purchased);
+  const OpeningWatch watchOfFile(path);
+  EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+  EXPECT_TRUE(watchOfFile.hasSeenOne());
+  std::filesystem::remove(path);
+  ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
+  const OpeningWatch watch(path);
+  EXPECT_THAT(keysOf(path), IsEmpty());
+  EXPECT_FALSE(watch.hasSeenOne());
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsFilesOfAFolderThatMayNotBeListed) {
+  std::filesystem::create_directories(folder_ / "album");
+  const std::vector<std::string> paths = {write("album/1.m4a", purchased), write("album/2.m4a", purchased)};
+  ASSERT_EQ(::chmod((folder_ / "album").c_str(), 0711), 0);
+  const WithoutRootsRights limited(folder_);
+  for (const std::string& path : paths) EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsFilesOfAFolderWithManyNames) {
+  for (int number = 0; number < 1000; ++number) write(std::to_string(number) + std::string(200, 'n'), {});
+  const std::vector<std::string> paths = {write("1.m4a", purchased), write("2.m4a", purchased)};
+  for (const std::string& path : paths) EXPECT_THAT(keysOf(path), ElementsAre("one ", "purd"));
+}
+
+TEST_F(Mpeg4MediaReaderTest, ReadsAFileThatCameAfterItsNeighbours) {
+  EXPECT_THAT(keysOf(write("1.m4a", purchased)), ElementsAre("one ", "purd"));
+  EXPECT_THAT(keysOf(write("2.m4a", purchased)), ElementsAre("one ", "purd"));
 }
 
 TEST_F(Mpeg4MediaReaderTest, FindsNothingInASocketOrADevice) {
