@@ -63,8 +63,9 @@ DoctorPlaces DoctorPlaces::ofThisMachine() {
   DoctorPlaces places;
   places.pressureFiles = MemoryPressurePlaces::ofProcess(environment).pressureFiles;
   places.preferenceFolder = XdgFolders::fromEnvironment(environment).config + "/norvex";
-  std::error_code error;
-  places.temporaryFolder = std::filesystem::temp_directory_path(error).string();
+  std::error_code error;  // none that can be used: where it should be, for the finding to name
+  const std::filesystem::path temporary = std::filesystem::temp_directory_path(error);
+  places.temporaryFolder = error ? "/tmp" : temporary.string();
   places.numbersLocale = localeOfNumbers(environment);
   return places;
 }
