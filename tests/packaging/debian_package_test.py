@@ -164,6 +164,7 @@ done
 dpkg --purge --force-all norvex >/dev/null 2>&1 || true
 rm -f /var/lib/man-db/auto-update  # reading all manual pages anew takes longer than all else
 mkdir -p /media/volume /run/session-test
+cp @FILES@ /run/session-test  # they may lie below the folder that is hidden next
 mount -t tmpfs tmpfs /media/volume
 echo text >/media/volume/letter.txt
 mount -t tmpfs tmpfs /root
@@ -176,7 +177,6 @@ done
 mkdir -p /run/systemd/user/com.brixo.NorvexAgent.service.d
 printf '[Unit]\nConditionACPower=\n[Service]\nCPUSchedulingPolicy=other\nNice=0\n' \
     >/run/systemd/user/com.brixo.NorvexAgent.service.d/always.conf
-cp @FILES@ /run/session-test
 """
 
 

@@ -7,6 +7,7 @@ usage: see agent_session.py
 import json
 import pathlib
 import subprocess
+import sys
 
 import session as lib
 from agent_session import BOTH, SLOW_TIMER, case, main
@@ -45,6 +46,9 @@ def the_strict_sandbox_hides_nothing_from_the_index(s):
 
 
 def switch_strict_sandbox_on():
+    if subprocess.run(["unshare", "--user", "true"], capture_output=True).returncode != 0:
+        print("users may have no namespaces of their own here, which the strict sandbox needs", file=sys.stderr)
+        sys.exit(77)
     drop_in = HOME / f".config/systemd/user/{SERVICE}.d/strict.conf"
     drop_in.parent.mkdir(parents=True)
     drop_in.symlink_to("/usr/share/norvex/strict.conf")
