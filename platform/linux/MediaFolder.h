@@ -32,7 +32,8 @@ class MediaFolder {
 
   std::string path_;  // with its last separator
   FileDescriptor folder_;
-  alignas(8) std::array<char, kListingSize> listing_;  // as the kernel wrote it
+  // As the kernel wrote it, without the marks that were taken.
+  alignas(8) std::array<char, kListingSize> listing_;
   std::size_t listingEnd_ = 0;
 };
 

@@ -3,13 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
-#include <poll.h>
 #include <sys/prctl.h>
 #include <sys/ptrace.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <chrono>
 #include <csignal>
 #include <functional>
 #include <nlohmann/json.hpp>
@@ -18,24 +16,13 @@
 #include "OwnProcesses.h"
 #include "OwnVolume.h"
 #include "ProcessStatus.h"
+#include "tests/support/Eventually.h"
 
 namespace norvex {
 namespace {
 
 namespace fs = std::filesystem;
 using nlohmann::json;
-
-constexpr std::chrono::seconds kPatience{60};
-constexpr int kStepMilliseconds = 5;
-
-bool eventually(const std::function<bool()>& isSo) {
-  const auto deadline = std::chrono::steady_clock::now() + kPatience;
-  while (!isSo()) {
-    if (std::chrono::steady_clock::now() >= deadline) return false;
-    ::poll(nullptr, 0, kStepMilliseconds);
-  }
-  return true;
-}
 
 void blockRunSignal() {
   sigset_t run;

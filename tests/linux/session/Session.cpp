@@ -1,12 +1,10 @@
 #include "Session.h"
 
-#include <poll.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <array>
 #include <charconv>
-#include <chrono>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
@@ -17,9 +15,6 @@
 
 namespace norvex {
 namespace {
-
-constexpr std::chrono::seconds kPatience{60};
-constexpr int kStepMilliseconds = 20;
 
 std::string home() {
   const char* folder = std::getenv("HOME");
@@ -73,15 +68,6 @@ std::string outputOf(const std::string& command) {
   while ((count = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0) output.append(buffer.data(), count);
   ::pclose(pipe);
   return output;
-}
-
-bool eventually(const std::function<bool()>& isSo) {
-  const auto deadline = std::chrono::steady_clock::now() + kPatience;
-  while (!isSo()) {
-    if (std::chrono::steady_clock::now() >= deadline) return false;
-    ::poll(nullptr, 0, kStepMilliseconds);
-  }
-  return true;
 }
 
 void logOutAndIn() {

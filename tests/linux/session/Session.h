@@ -4,10 +4,10 @@
 
 #include <sys/types.h>
 
-#include <functional>
 #include <string>
 
 #include "platform/linux/UserManager.h"
+#include "tests/support/Eventually.h"
 
 namespace norvex {
 
@@ -19,10 +19,6 @@ bool shell(const std::string& command);
 
 // What a shell command prints on its standard output.
 std::string outputOf(const std::string& command);
-
-// Asks again and again until it is so; false when it is not so after a minute. For what the session's own
-// programs do in their own time.
-bool eventually(const std::function<bool()>& isSo);
 
 // Ends the manager as a log-out does, and waits for the one of the next log-in.
 void logOutAndIn();

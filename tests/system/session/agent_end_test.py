@@ -20,12 +20,18 @@ PRESSURE_FILE = (f"mkfifo {PRESSURE}; chown 4242 {PRESSURE}; "
                  f'echo Environment=MEMORY_PRESSURE_WATCH={PRESSURE} >>"/etc/systemd/user/$service.d/test.conf"')
 
 
-@case(LARGE_HOME + "; " + SLOW_TIMER)
-def ended_while_measuring_it_has_written_nothing(s):
-    lib.fill_folder(HOME / "Downloads", 300_000)
+def agent_that_measures(s, entries=300_000, size=30_000_000):
+    """The process of an agent in the middle of a folder of so many entries, which has grown beyond the size in bytes."""
+    lib.fill_folder(HOME / "Downloads", entries)
     systemctl("start", "--no-block", SERVICE)
     process = s.agent_process()
-    lib.wait_until_larger(process, 30_000_000)
+    lib.wait_until_larger(process, size)
+    return process
+
+
+@case(LARGE_HOME + "; " + SLOW_TIMER)
+def ended_while_measuring_it_has_written_nothing(s):
+    process = agent_that_measures(s)
     with lib.held(process):  # so that it is not done before the manager has come to it
         systemctl("stop", SERVICE)
     assert s.exit_of_agent() == "killed TERM success", s.exit_of_agent()
@@ -35,10 +41,7 @@ def ended_while_measuring_it_has_written_nothing(s):
 
 @case(LARGE_HOME + "; " + SLOW_TIMER)
 def ended_while_reporting_it_finishes_the_report(s):
-    lib.fill_folder(HOME / "Downloads", 300_000)
-    systemctl("start", "--no-block", SERVICE)
-    process = s.agent_process()
-    lib.wait_until_larger(process, 30_000_000)
+    process = agent_that_measures(s)
     # Behind its messages the agent waits for the manager, which is to switch the job off: so it is there to be ended.
     with lib.held(lib.parent_of(process)):
         s.journal.wait(lib.is_report, "the first message")
@@ -52,11 +55,8 @@ def ended_while_reporting_it_finishes_the_report(s):
 
 @case(f"{LARGE_HOME}; {SLOW_TIMER}; {PRESSURE_FILE}")
 def below_its_limit_it_goes_on_when_memory_is_short(s):
-    lib.fill_folder(HOME / "Downloads", 300_000)
-    systemctl("start", "--no-block", SERVICE)
     pressure = os.open(PRESSURE, os.O_RDWR | os.O_NONBLOCK)
-    process = s.agent_process()
-    lib.wait_until_larger(process, 30_000_000)
+    process = agent_that_measures(s)
     with lib.held(process):
         os.write(pressure, b"x")
     s.wait_for_runs()
@@ -70,11 +70,8 @@ def below_its_limit_it_goes_on_when_memory_is_short(s):
 
 @case(f"{LARGE_HOME}; {SLOW_TIMER}; {PRESSURE_FILE}")
 def above_its_limit_when_memory_is_short_it_gives_up(s):
-    lib.fill_folder(HOME / "Downloads", 2_000_000)
-    systemctl("start", "--no-block", SERVICE)
     pressure = os.open(PRESSURE, os.O_RDWR | os.O_NONBLOCK)
-    process = s.agent_process()
-    lib.wait_until_larger(process, MEMORY_LIMIT)
+    process = agent_that_measures(s, entries=2_000_000, size=MEMORY_LIMIT)
     with lib.held(process):
         os.write(pressure, b"x")
     s.wait_for_runs()
